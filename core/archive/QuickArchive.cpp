@@ -1,0 +1,317 @@
+#include "archive/QuickArchive.hpp"
+
+#include "platform/Text.hpp"
+
+#include <algorithm>
+#include <cstring>
+#include <fstream>
+#include <istream>
+#include <ostream>
+
+namespace OrvexKavorCore {
+
+namespace {
+
+std::uint64_t chunkIndex(std::uint64_t position) { return position >> 12; }
+std::size_t chunkOffset(std::uint64_t position) { return static_cast<std::size_t>(position & 0xFFF); }
+
+boost::shared_ptr<QuickArchive::Chunk> newChunk() {
+    auto chunk = boost::shared_ptr<QuickArchive::Chunk>(new QuickArchive::Chunk);
+    chunk->fill(0);
+    return chunk;
+}
+
+} // namespace
+
+std::string ReadFailure::describe() const {
+    std::string text = recordPath.empty() ? reason : recordPath + ": " + reason;
+    text += " at offset " + std::to_string(offset);
+    return text;
+}
+
+QuickArchive::QuickArchive(std::size_t initialChunks) {
+    chunks_.reserve(initialChunks);
+    for (std::size_t i = 0; i < initialChunks; ++i) chunks_.push_back(newChunk());
+}
+
+QuickArchive::QuickArchive(const void* data, std::size_t length) {
+    if (length >= kMaxSize) {
+        fail("the data is 4 GiB or larger");
+        return;
+    }
+    const std::size_t count = (length + kChunkSize - 1) / kChunkSize;
+    chunks_.reserve(count);
+    const auto* bytes = static_cast<const std::uint8_t*>(data);
+    for (std::size_t k = 0; k < count; ++k) {
+        auto chunk = newChunk();
+        const std::size_t n = std::min(kChunkSize, length - k * kChunkSize);
+        std::memcpy(chunk->data(), bytes + k * kChunkSize, n);
+        chunks_.push_back(std::move(chunk));
+    }
+    writePos_ = length;
+}
+
+QuickArchive::~QuickArchive() = default;
+
+void QuickArchive::reset() {
+    chunks_.clear();
+    readPos_ = 0;
+    writePos_ = 0;
+    frames_.clear();
+    failure_.reset();
+}
+
+std::uint64_t QuickArchive::remaining() const {
+    const std::uint64_t capacity = static_cast<std::uint64_t>(chunks_.size()) * kChunkSize;
+    return readPos_ < capacity ? capacity - readPos_ : 0;
+}
+
+bool QuickArchive::canHold(std::uint64_t count, std::uint64_t itemSize) const {
+    if (itemSize == 0) return true;
+    return count <= remaining() / itemSize;
+}
+
+void QuickArchive::skip(std::uint64_t bytes) { readPos_ += bytes; }
+
+QuickArchive::Chunk& QuickArchive::chunkFor(std::uint64_t position) {
+    // Positions only ever advance by whole values, so at most one chunk is missing.
+    while (chunks_.size() <= chunkIndex(position)) chunks_.push_back(newChunk());
+    return *chunks_[chunkIndex(position)];
+}
+
+void QuickArchive::putByte(std::uint8_t b) {
+    chunkFor(writePos_)[chunkOffset(writePos_)] = b;
+    ++writePos_;
+}
+
+bool QuickArchive::getByte(std::uint8_t& b) {
+    const std::uint64_t position = readPos_++;
+    if (chunkIndex(position) >= chunks_.size()) return false;
+    b = (*chunks_[chunkIndex(position)])[chunkOffset(position)];
+    return true;
+}
+
+void QuickArchive::putRaw(const void* data, std::size_t length) {
+    const auto* bytes = static_cast<const std::uint8_t*>(data);
+    while (length > 0) {
+        Chunk& chunk = chunkFor(writePos_);
+        const std::size_t offset = chunkOffset(writePos_);
+        const std::size_t n = std::min(length, kChunkSize - offset);
+        std::memcpy(chunk.data() + offset, bytes, n);
+        bytes += n;
+        length -= n;
+        writePos_ += n;
+    }
+}
+
+bool QuickArchive::getRaw(void* data, std::size_t length) {
+    auto* bytes = static_cast<std::uint8_t*>(data);
+    bool complete = true;
+    while (length > 0) {
+        const std::uint64_t index = chunkIndex(readPos_);
+        const std::size_t offset = chunkOffset(readPos_);
+        const std::size_t n = std::min(length, kChunkSize - offset);
+        if (index < chunks_.size())
+            std::memcpy(bytes, chunks_[index]->data() + offset, n);
+        else
+            complete = false; // past the last chunk: the destination keeps its bytes
+        bytes += n;
+        length -= n;
+        readPos_ += n;
+    }
+    return complete;
+}
+
+void QuickArchive::write(const Vector& v) {
+    write(v.x);
+    write(v.y);
+    write(v.z);
+}
+void QuickArchive::write(const Color& v) {
+    write(v.r);
+    write(v.g);
+    write(v.b);
+}
+void QuickArchive::write(const AColor& v) {
+    write(v.r);
+    write(v.g);
+    write(v.b);
+    write(v.a);
+}
+void QuickArchive::write(const Matrix& v) {
+    for (const Vector& column : v.m) write(column);
+}
+void QuickArchive::write(const Transform& v) {
+    write(v.m);
+    write(v.offs);
+}
+
+void QuickArchive::read(bool& v) {
+    std::uint8_t b = v ? 1 : 0;
+    getByte(b);
+    v = b != 0;
+}
+void QuickArchive::read(Vector& v) {
+    Vector t{};
+    read(t.x);
+    read(t.y);
+    read(t.z);
+    v = t;
+}
+void QuickArchive::read(Color& v) {
+    Color t{};
+    read(t.r);
+    read(t.g);
+    read(t.b);
+    v = t;
+}
+void QuickArchive::read(AColor& v) {
+    AColor t{};
+    read(t.r);
+    read(t.g);
+    read(t.b);
+    read(t.a);
+    v = t;
+}
+void QuickArchive::read(Matrix& v) {
+    for (Vector& column : v.m) read(column);
+}
+void QuickArchive::read(Transform& v) {
+    read(v.m);
+    read(v.offs);
+}
+
+void QuickArchive::writeString(std::string_view narrow) {
+    write(static_cast<std::uint32_t>(narrow.size()));
+    putRaw(narrow.data(), narrow.size());
+}
+
+bool QuickArchive::readString(std::string& out) {
+    const auto length = get<std::uint32_t>();
+    if (length == 0) {
+        out.clear();
+        return true;
+    }
+    if (!canHold(length, 1))
+        return fail("a string of " + std::to_string(length) + " bytes is longer than the " +
+                    std::to_string(remaining()) + " bytes left");
+    std::string buffer(length, '\0');
+    getRaw(buffer.data(), length);
+    buffer.resize(text::upToFirstNul(buffer).size());
+    out = std::move(buffer);
+    return true;
+}
+
+void QuickArchive::writeWString(std::string_view utf8) {
+    const std::string_view stored = text::upToFirstNul(utf8);
+    writeString(text::isValidUtf8(stored) ? stored : std::string_view{});
+}
+
+bool QuickArchive::readWString(std::string& out) {
+    std::string bytes;
+    if (!readString(bytes)) return false;
+    out = text::decodeStoredText(bytes);
+    return true;
+}
+
+void QuickArchive::writeBytes(const void* data, std::uint32_t length) {
+    write(length);
+    putRaw(data, length);
+}
+
+// Reading a Bytes block into a buffer of capacity K: the stored count N is read,
+// then min(K, N) bytes. When N differs from K and `strict` is set, the read
+// position goes back to the count (the next reader reads it again). Otherwise a
+// surplus beyond K is skipped. The stored count is returned; callers compare it
+// with the one they expected.
+std::optional<std::uint32_t> QuickArchive::readBytes(void* buffer, std::uint32_t capacity, bool strict) {
+    const std::uint64_t start = readPos_;
+    const auto length = get<std::uint32_t>();
+    if (!canHold(length, 1)) {
+        fail("a block of " + std::to_string(length) + " bytes is longer than the " + std::to_string(remaining()) +
+             " bytes left");
+        return std::nullopt;
+    }
+    getRaw(buffer, std::min(capacity, length));
+    if (length != capacity && strict) {
+        readPos_ = start;
+        return length;
+    }
+    if (length > capacity) skip(length - capacity);
+    return length;
+}
+
+bool QuickArchive::save(std::ostream& out) const {
+    const auto count = static_cast<std::uint32_t>(chunks_.size());
+    out.write(reinterpret_cast<const char*>(&count), sizeof count);
+    for (const auto& chunk : chunks_) out.write(reinterpret_cast<const char*>(chunk->data()), kChunkSize);
+    return true;
+}
+
+bool QuickArchive::load(std::istream& in) {
+    reset();
+    std::uint32_t count = 0;
+    if (!in.read(reinterpret_cast<char*>(&count), sizeof count)) return fail("the chunk count is missing");
+    if (count >= kMaxSize / kChunkSize) return fail("the archive claims 4 GiB or more");
+    // Chunks are appended as they arrive, so a false count costs nothing.
+    for (std::uint32_t k = 0; k < count; ++k) {
+        auto chunk = newChunk();
+        if (!in.read(reinterpret_cast<char*>(chunk->data()), kChunkSize))
+            return fail("the archive ends inside chunk " + std::to_string(k) + " of " + std::to_string(count));
+        chunks_.push_back(std::move(chunk));
+    }
+    return true;
+}
+
+bool QuickArchive::saveToFile(const std::filesystem::path& path) const {
+    std::ofstream out(path, std::ios::binary | std::ios::trunc);
+    if (!out) return false;
+    save(out);
+    out.close();
+    return static_cast<bool>(out);
+}
+
+bool QuickArchive::loadFromFile(const std::filesystem::path& path) {
+    std::error_code ec;
+    if (!std::filesystem::is_regular_file(path, ec)) return false;
+    std::ifstream in(path, std::ios::binary);
+    if (!in) return false;
+    return load(in);
+}
+
+std::string QuickArchive::recordPath() const {
+    std::string path;
+    for (const Frame& frame : frames_) {
+        if (!path.empty()) path += " / ";
+        std::string part = frame.what ? frame.what : "";
+        if (frame.index >= 0) part += (part.empty() ? "" : " ") + std::to_string(frame.index);
+        if (frame.name) part += (part.empty() ? "" : " ") + std::string(frame.name);
+        path += part;
+    }
+    return path;
+}
+
+bool QuickArchive::fail(std::string_view reason) {
+    if (!failure_) failure_ = ReadFailure{std::string(reason), readPos_, recordPath()};
+    return false;
+}
+
+QuickArchive::Scope::Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index)
+    : Scope(ar, what, name, index, true) {}
+
+QuickArchive::Scope::Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index, bool nests)
+    : ar_(ar), nests_(nests), pushed_(ar.frames_.size() < kMaxNesting), ok_(true) {
+    // The path is kept only up to the limit: deeper frames add nothing a user needs.
+    if (pushed_) ar_.frames_.push_back(Frame{what, name, index});
+    if (nests_ && ++ar_.nesting_ > kMaxNesting) {
+        ok_ = false;
+        ar_.fail("records nested deeper than " + std::to_string(kMaxNesting) + " levels");
+    }
+}
+
+QuickArchive::Scope::~Scope() {
+    if (nests_) --ar_.nesting_;
+    if (pushed_) ar_.frames_.pop_back();
+}
+
+} // namespace OrvexKavorCore

@@ -1,0 +1,36 @@
+#pragma once
+// ZelOptFile: a render-options file (".zelopt").
+//
+// The file is the archive's chunks and nothing else: chunk k (4096 bytes) at
+// offset 4096k, no header and no chunk count. The options set's own record begins
+// with its version word; the bytes behind the end of the record are padding.
+#include "archive/QuickArchive.hpp"
+#include "archive/Serializable.hpp"
+
+#include <filesystem>
+#include <optional>
+#include <string>
+
+namespace OrvexKavorCore {
+
+class ZelOptFile {
+public:
+    virtual ~ZelOptFile() = default;
+
+    // Stores the object's record: serialised completely first, then written to a
+    // temporary file and renamed over `path`.
+    virtual bool writeFile(OrvexSerializable& object, const std::filesystem::path& path);
+    // Loads the object from the file; false for a missing, empty or unreadable file
+    // or a record the object rejects.
+    virtual bool readFile(OrvexSerializable& object, const std::filesystem::path& path);
+
+    // The XML text of the file at `path`, or its pass-through text (see Conversion.hpp).
+    std::string toXml(const std::filesystem::path& path);
+
+    const std::optional<ReadFailure>& lastReadFailure() const { return lastReadFailure_; }
+
+private:
+    std::optional<ReadFailure> lastReadFailure_;
+};
+
+} // namespace OrvexKavorCore

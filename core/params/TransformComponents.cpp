@@ -1,0 +1,88 @@
+#include "params/TransformComponents.hpp"
+
+#include "archive/QuickArchive.hpp"
+
+#include <cmath>
+
+namespace OrvexKavorCore {
+
+namespace {
+
+// A matrix of one axis: its rotation, then its own column mirrored and scaled.
+// All arithmetic is in 32-bit floats.
+Matrix axisMatrix(int axis, float degrees, float scale, bool mirror) {
+    constexpr float kPi = 3.1415927f;
+    const float k = kPi / 180.0f;
+    const float r = degrees * k;
+    const float c = static_cast<float>(std::cos(static_cast<double>(r)));
+    const float s = static_cast<float>(std::sin(static_cast<double>(r)));
+    Matrix m = Matrix::identity();
+    switch (axis) {
+    case 0:
+        m[1] = {0, c, s};
+        m[2] = {0, -s, c};
+        break;
+    case 1:
+        m[0] = {c, 0, -s};
+        m[2] = {s, 0, c};
+        break;
+    default:
+        m[0] = {c, s, 0};
+        m[1] = {-s, c, 0};
+        break;
+    }
+    Vector& own = m[axis];
+    const float factor = (mirror ? -1.0f : 1.0f);
+    own = {own.x * factor, own.y * factor, own.z * factor};
+    own = {own.x * scale, own.y * scale, own.z * scale};
+    return m;
+}
+
+Vector apply(const Matrix& a, const Vector& v) {
+    return {a[0].x * v.x + a[1].x * v.y + a[2].x * v.z, a[0].y * v.x + a[1].y * v.y + a[2].y * v.z,
+            a[0].z * v.x + a[1].z * v.y + a[2].z * v.z};
+}
+
+// Column j of A·B is A applied to column j of B.
+Matrix multiply(const Matrix& a, const Matrix& b) { return Matrix{{apply(a, b[0]), apply(a, b[1]), apply(a, b[2])}}; }
+
+} // namespace
+
+bool TransformComponents::writeToArchive(QuickArchive& ar) {
+    ar.write(VersionWord::make(0, 1));
+    for (float v : {x_rotation, y_rotation, z_rotation, x_scale, y_scale, z_scale, x_offset, y_offset, z_offset})
+        ar.write(v);
+    for (std::int32_t v : {x_mirror, y_mirror, z_mirror}) ar.write(v);
+    return true;
+}
+
+bool TransformComponents::readFromArchive(QuickArchive& ar) {
+    *this = TransformComponents{};
+    const auto version = ar.get<VersionWord>();
+    if (!version.is(0, 1)) return ar.fail("unknown transform components version");
+    for (float* v : {&x_rotation, &y_rotation, &z_rotation, &x_scale, &y_scale, &z_scale, &x_offset, &y_offset,
+                     &z_offset})
+        ar.read(*v);
+    for (std::int32_t* v : {&x_mirror, &y_mirror, &z_mirror}) ar.read(*v);
+    return true;
+}
+
+Matrix TransformComponents::buildMatrix() const {
+    const Matrix mx = axisMatrix(0, x_rotation, x_scale, x_mirror != 0);
+    const Matrix my = axisMatrix(1, y_rotation, y_scale, y_mirror != 0);
+    const Matrix mz = axisMatrix(2, z_rotation, z_scale, z_mirror != 0);
+    return multiply(multiply(mx, my), mz);
+}
+
+Transform TransformComponents::buildTransform() const {
+    return Transform{buildMatrix(), Vector{x_offset, y_offset, z_offset}};
+}
+
+bool operator==(const TransformComponents& a, const TransformComponents& b) {
+    return a.x_rotation == b.x_rotation && a.y_rotation == b.y_rotation && a.z_rotation == b.z_rotation &&
+           a.x_scale == b.x_scale && a.y_scale == b.y_scale && a.z_scale == b.z_scale && a.x_offset == b.x_offset &&
+           a.y_offset == b.y_offset && a.z_offset == b.z_offset && a.x_mirror == b.x_mirror &&
+           a.y_mirror == b.y_mirror && a.z_mirror == b.z_mirror;
+}
+
+} // namespace OrvexKavorCore

@@ -1,0 +1,12 @@
+#include "textures/BaseTexture.hpp"
+
+namespace OrvexKavorCore {
+
+TexturePtr createTexture(std::int32_t kind) {
+    switch (kind) {
+    default:
+        return {};
+    }
+}
+
+} // namespace OrvexKavorCore

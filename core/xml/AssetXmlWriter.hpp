@@ -1,0 +1,144 @@
+#pragma once
+// AssetXmlWriter: writes the XML asset document.
+//
+// A document is a list of assets, each describing one renderer plugin with typed
+// parameters. The writer appends UTF-8 text to a std::string it does not own; it
+// never uses iostreams. Narrow strings (plugin types, asset types, layouts,
+// parameter names, labels) are widened byte for byte; wide strings (urls, names,
+// string values) are UTF-8 already.
+//
+// Text of the document, line by line, with two spaces of indentation per level:
+//   <Assets>
+//     <Asset layout="defkvmat" renderer="kavor" type="material" url="/Oak" >
+//       <plugin>
+//         <kavorplugin name="MtlORVEX" type="material">
+//           <parameters>
+//             <parameter type="integer" name="double_sided" listType="none" label="double_sided">
+//               <value>1</value>
+//             </parameter>
+//           </parameters>
+//         </kavorplugin>
+//       </plugin>
+//     </Asset>
+//   </Assets>
+#include "platform/KavorTypes.hpp"
+
+#include <boost/any.hpp>
+#include <boost/shared_ptr.hpp>
+
+#include <cstdint>
+#include <map>
+#include <string>
+#include <string_view>
+
+namespace OrvexKavorCore {
+
+class BaseMaterial;
+class BaseTexture;
+class BaseUVW;
+class BaseCamera;
+class BaseBitmap;
+class BaseLight;
+class TransformComponents;
+
+// Appends `text` with the five XML entities for " & ' < >.
+void appendEscaped(std::string& out, std::string_view text);
+std::string escapeXml(std::string_view text);
+
+class AssetXmlWriter {
+public:
+    explicit AssetXmlWriter(std::string& output) : out_(output) {}
+
+    std::string& output() { return out_; }
+    std::uint32_t depth() const { return depth_; }
+
+    // Sun identifier -> url of the sun light asset already written in this document.
+    std::map<std::string, std::string>& sunUrls() { return sunUrls_; }
+
+    // --- document framing ---
+    void beginDocument();
+    void endDocument();
+    void beginElement(std::string_view name);
+    void endElement(std::string_view name);
+    void beginAsset(std::string_view url, std::string_view type, std::string_view layout);
+    void endAsset();
+    void beginPlugin(std::string_view name, std::string_view type);
+    void endPlugin();
+    void beginParameters();
+    void endParameters();
+    void beginParameter(std::string_view name, std::string_view type, std::string_view label,
+                        std::string_view listType, bool userData);
+    void endParameter();
+    void beginValueBlock();
+    void endValueBlock();
+    void beginInlineValue();
+    void endInlineValue();
+    void writeText(std::string_view text) { out_.append(text); }
+    void increaseDepth() { ++depth_; }
+    void decreaseDepth() { --depth_; }
+
+    // --- typed parameters (an empty label repeats the name) ---
+    void writeFloat(std::string_view name, float value, std::string_view label = {}, bool userData = false);
+    void writeInteger(std::string_view name, std::int32_t value, std::string_view label = {}, bool userData = false);
+    void writeBool(std::string_view name, bool value, std::string_view label = {}, bool userData = false);
+    // The text is written with & < > escaped, so that every document is well-formed.
+    void writeString(std::string_view name, std::string_view value, std::string_view label = {},
+                     bool userData = false);
+    void writeVector(std::string_view name, const Vector& value, std::string_view label = {});
+    void writeColor(std::string_view name, const Color& value, std::string_view label = {});
+    void writeAColor(std::string_view name, const AColor& value, std::string_view label = {});
+    void writeMatrix(std::string_view name, const Matrix& value, std::string_view label = {});
+    void writeTransform(std::string_view name, const Transform& value, std::string_view label = {});
+    void writeComponentMatrix(std::string_view name, const TransformComponents& value, std::string_view label = {});
+    void writeComponentTransform(std::string_view name, const TransformComponents& value,
+                                 std::string_view label = {});
+
+    // "plugin" parameters. The value is the escaped `path`, "/", and the object's
+    // plugin type; for a material, the empty path's "/" and the escaped name. An
+    // absent object writes the parameter without a value.
+    void writePlugin(std::string_view name, const boost::shared_ptr<BaseTexture>& object, std::string_view path,
+                     std::string_view label = {});
+    void writePlugin(std::string_view name, const boost::shared_ptr<BaseUVW>& object, std::string_view path,
+                     std::string_view label = {});
+    void writePlugin(std::string_view name, const boost::shared_ptr<BaseCamera>& object, std::string_view path,
+                     std::string_view label = {});
+    void writePlugin(std::string_view name, const boost::shared_ptr<BaseBitmap>& object, std::string_view path,
+                     std::string_view label = {});
+    void writePlugin(std::string_view name, const boost::shared_ptr<BaseLight>& object, std::string_view path,
+                     std::string_view label = {});
+    void writePlugin(std::string_view name, const boost::shared_ptr<BaseMaterial>& object, std::string_view path,
+                     std::string_view label = {});
+    // A sun light: the value is `url`, escaped (the url the sun map holds for it).
+    void writeSunPlugin(std::string_view name, const boost::shared_ptr<BaseLight>& sun, std::string_view url,
+                        std::string_view label = {});
+    // A generic value holding a shared pointer of one of the families. A value of
+    // any other type is a programming error: std::invalid_argument.
+    void writePlugin(std::string_view name, const boost::any& object, std::string_view path,
+                     std::string_view label = {});
+
+    // --- lists ---
+    void beginList(std::string_view name, std::string_view listType, std::string_view label = {});
+    // <entry>escaped text</entry>
+    void writeEntry(std::string_view text);
+    // <string>"text"</string>, the text with & < > escaped.
+    void writeStringEntry(std::string_view text);
+    void endList();
+
+private:
+    void indent();
+    void line(std::string_view text); // indent, text, line feed
+    void appendNarrow(std::string_view narrow);
+    void inlineValue(std::string_view text);
+    void floatLine(std::string_view tag, float value);
+    void vectorBlock(const Vector& v);
+    void componentLines(const TransformComponents& c);
+    void pluginReference(std::string_view name, std::string_view path, std::string_view last, bool escapeLast,
+                         std::string_view label);
+    void emptyPlugin(std::string_view name, std::string_view label);
+
+    std::string& out_;
+    std::uint32_t depth_ = 0;
+    std::map<std::string, std::string> sunUrls_;
+};
+
+} // namespace OrvexKavorCore
