@@ -20,7 +20,6 @@
 #include "archive/QuickArchive.hpp"
 
 #include <cstdint>
-#include <span>
 #include <string>
 #include <type_traits>
 
@@ -130,8 +129,8 @@ constexpr Field<Obj> discarded(const char* name, Versions versions) {
 
 // Reads the fields that `version` holds, in table order. False when a field's
 // read fails (a count beyond the data, a failing sub-record).
-template <class Obj>
-bool readFields(QuickArchive& ar, Obj& object, std::span<const Field<Obj>> fields, unsigned version) {
+template <class Obj, class Fields>
+bool readFields(QuickArchive& ar, Obj& object, const Fields& fields, unsigned version) {
     for (const Field<Obj>& f : fields) {
         if (!f.versions.holds(version)) continue;
         auto scope = QuickArchive::Scope::label(ar, f.name);
@@ -140,24 +139,24 @@ bool readFields(QuickArchive& ar, Obj& object, std::span<const Field<Obj>> field
     return true;
 }
 
-template <class Obj>
-bool writeFields(QuickArchive& ar, Obj& object, std::span<const Field<Obj>> fields, unsigned version) {
+template <class Obj, class Fields>
+bool writeFields(QuickArchive& ar, Obj& object, const Fields& fields, unsigned version) {
     for (const Field<Obj>& f : fields)
         if (f.versions.holds(version) && !f.write(ar, object)) return false;
     return true;
 }
 
 // Every field of the table equal.
-template <class Obj>
-bool fieldsEqual(const Obj& a, const Obj& b, std::span<const Field<Obj>> fields) {
+template <class Obj, class Fields>
+bool fieldsEqual(const Obj& a, const Obj& b, const Fields& fields) {
     for (const Field<Obj>& f : fields)
         if (!f.equal(a, b)) return false;
     return true;
 }
 
 // The name of the first unequal field, or nullptr (for tests and diagnostics).
-template <class Obj>
-const char* firstDifference(const Obj& a, const Obj& b, std::span<const Field<Obj>> fields) {
+template <class Obj, class Fields>
+const char* firstDifference(const Obj& a, const Obj& b, const Fields& fields) {
     for (const Field<Obj>& f : fields)
         if (!f.equal(a, b)) return f.name;
     return nullptr;
