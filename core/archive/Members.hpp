@@ -20,10 +20,12 @@ template <class Base>
 struct Family;
 
 // Reads a mandatory member: its kind id, a new object of that kind put into
-// `member`, then the object's record. `name` labels the member in failure reports.
+// `member`, then the object's record. `name` and `index` label the member in
+// failure reports ("texture color_tex", "BRDF layer 2").
 template <class Base>
-bool readMember(QuickArchive& ar, boost::shared_ptr<Base>& member, const char* name = nullptr) {
-    QuickArchive::Scope scope(ar, Family<Base>::word, name);
+bool readMember(QuickArchive& ar, boost::shared_ptr<Base>& member, const char* name = nullptr,
+                std::int64_t index = -1) {
+    QuickArchive::Scope scope(ar, Family<Base>::word, name, index);
     if (!scope) return false;
     const auto kind = ar.get<std::int32_t>();
     boost::shared_ptr<Base> object = Family<Base>::create(kind);

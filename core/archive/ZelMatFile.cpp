@@ -1,0 +1,202 @@
+#include "archive/ZelMatFile.hpp"
+
+#include "materials/MaterialAssets.hpp"
+#include "platform/FileIo.hpp"
+#include "xml/AssetXmlWriter.hpp"
+#include "platform/Text.hpp"
+
+#include <algorithm>
+#include <cstring>
+#include <ios>
+#include <istream>
+#include <iterator>
+#include <ostream>
+#include <sstream>
+
+namespace OrvexKavorCore {
+
+namespace {
+
+constexpr std::size_t kHeaderSize = 8;
+constexpr VersionWord kWrittenVersion = VersionWord::make(0, 3);
+
+std::uint32_t readLittleEndian32(const char* p) {
+    std::uint32_t v = 0;
+    std::memcpy(&v, p, sizeof v);
+    return v;
+}
+
+} // namespace
+
+std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(std::string_view bytes, ReadFailure* failure) {
+    const auto reject = [&](std::string reason, std::uint64_t offset) -> std::optional<Framing> {
+        if (failure) *failure = ReadFailure{std::move(reason), offset, "header"};
+        return std::nullopt;
+    };
+    if (bytes.size() < kHeaderSize) return reject("the file is shorter than its 8-byte header", 0);
+    const VersionWord version{readLittleEndian32(bytes.data())};
+    const std::uint32_t count = readLittleEndian32(bytes.data() + 4);
+    if (count == 0) return reject("the file holds no materials", 4);
+    if (version.first() != 0 || version.second() < 1 || version.second() > 3)
+        return reject("unknown file version (" + std::to_string(version.first()) + ", " +
+                          std::to_string(version.second()) + ")",
+                      0);
+
+    const std::string_view body = bytes.substr(kHeaderSize);
+    Framing framing{version.second(), count, QuickArchive(0)};
+    switch (framing.generation) {
+    case 1: {
+        // The first generation's writer lost every carriage-return byte; so does its reader.
+        std::string kept;
+        kept.reserve(body.size());
+        std::copy_if(body.begin(), body.end(), std::back_inserter(kept), [](char c) { return c != '\x0D'; });
+        framing.archive = QuickArchive(kept.data(), kept.size());
+        break;
+    }
+    case 2:
+        framing.archive = QuickArchive(body.data(), body.size());
+        break;
+    default: {
+        std::istringstream in{std::string(body)};
+        if (!framing.archive.load(in)) {
+            ReadFailure why = *framing.archive.failure();
+            why.offset += kHeaderSize;
+            why.recordPath = "archive image";
+            if (failure) *failure = std::move(why);
+            return std::nullopt;
+        }
+        break;
+    }
+    }
+    if (framing.archive.failed()) {
+        if (failure) *failure = *framing.archive.failure();
+        return std::nullopt;
+    }
+    return framing;
+}
+
+bool ZelMatFile::readFromBytes(std::string_view bytes) {
+    lastReadFailure_.reset();
+    ReadFailure headerFailure;
+    std::optional<Framing> framing = readFraming(bytes, &headerFailure);
+    if (!framing) {
+        lastReadFailure_ = std::move(headerFailure);
+        return false;
+    }
+    QuickArchive& ar = framing->archive;
+    // A material record takes at least a kind id and a version word.
+    if (!ar.canHold(framing->count, 8)) {
+        ar.fail("a count of " + std::to_string(framing->count) + " materials cannot fit in the file");
+        lastReadFailure_ = ar.failure();
+        return false;
+    }
+    std::vector<MaterialPtr> read;
+    for (std::uint32_t i = 0; i < framing->count; ++i) {
+        MaterialPtr material;
+        if (!readMember(ar, material, nullptr, i)) {
+            if (!ar.failed()) {
+                QuickArchive::Scope scope(ar, "material", nullptr, i);
+                ar.fail("the record was rejected");
+            }
+            lastReadFailure_ = ar.failure();
+            return false;
+        }
+        read.push_back(std::move(material));
+    }
+    materials = std::move(read);
+    return true;
+}
+
+bool ZelMatFile::readFromStream(std::istream& in) {
+    const std::string bytes{std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+    return readFromBytes(bytes);
+}
+
+bool ZelMatFile::writeToStream(std::ostream& out) {
+    lastError_.clear();
+    if (materials.empty()) {
+        lastError_ = "a material library needs at least one material";
+        return false;
+    }
+    QuickArchive ar(1);
+    for (const MaterialPtr& material : materials) {
+        if (!material) {
+            lastError_ = "the material list holds an empty entry";
+            return false;
+        }
+        ar.write(static_cast<std::int32_t>(material->kindId()));
+        if (!material->writeToArchive(ar)) {
+            lastError_ = "An error has occurred while attempting to serialize \"" + material->name +
+                         "\" - aborting zelmat creation";
+            return false;
+        }
+    }
+    out.write(reinterpret_cast<const char*>(&kWrittenVersion.raw), sizeof kWrittenVersion.raw);
+    const auto count = static_cast<std::uint32_t>(materials.size());
+    out.write(reinterpret_cast<const char*>(&count), sizeof count);
+    ar.save(out);
+    return static_cast<bool>(out);
+}
+
+bool ZelMatFile::add(const MaterialPtr& material) {
+    materials.push_back(material);
+    return true;
+}
+
+bool ZelMatFile::get(std::size_t index, MaterialPtr& out) const {
+    if (index >= materials.size()) return false;
+    out = materials[index];
+    return true;
+}
+
+int ZelMatFile::indexOf(std::string_view name) const {
+    for (std::size_t i = 0; i < materials.size(); ++i)
+        if (materials[i] && text::equalsIgnoringAsciiCase(materials[i]->name, name)) return static_cast<int>(i);
+    return -1;
+}
+
+bool ZelMatFile::get(std::string_view name, MaterialPtr& out) const {
+    const int index = indexOf(name);
+    return index >= 0 && get(static_cast<std::size_t>(index), out);
+}
+
+void ZelMatFile::names(std::vector<std::string>& out) const {
+    for (const MaterialPtr& material : materials) out.push_back(material ? material->name : std::string());
+}
+
+bool ZelMatFile::load(const std::filesystem::path& path) {
+    const std::optional<std::string> bytes = readRegularFile(path);
+    if (!bytes) {
+        lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
+        return false;
+    }
+    return readFromBytes(*bytes);
+}
+
+bool ZelMatFile::save(const std::filesystem::path& path) {
+    std::ostringstream out;
+    if (!writeToStream(out)) return false;
+    return writeFileAtomically(path, out.view(), &lastError_);
+}
+
+std::ios_base::openmode ZelMatFile::probeOpenMode(const std::filesystem::path& path) {
+    const std::optional<std::string> bytes = readRegularFile(path);
+    if (!bytes) return std::ios_base::in;
+    if (bytes->size() >= 4 && VersionWord{readLittleEndian32(bytes->data())}.is(0, 1)) return std::ios_base::in;
+    return std::ios_base::in | std::ios_base::binary;
+}
+
+std::string ZelMatFile::toXml(const std::filesystem::path& path) {
+    const std::optional<std::string> bytes = readRegularFile(path);
+    if (!bytes) return {};
+    if (readFromBytes(*bytes)) {
+        std::string xml;
+        AssetXmlWriter writer(xml);
+        for (const MaterialPtr& material : materials) writeMaterialAssets(writer, material);
+        return xml;
+    }
+    // Not a binary library: the file is taken to be XML text already.
+    return text::decodeStoredText(text::upToFirstNul(*bytes));
+}
+
+} // namespace OrvexKavorCore

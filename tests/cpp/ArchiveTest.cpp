@@ -1,0 +1,286 @@
+// The archive's byte layouts, its chunking, and its guards against damaged data.
+#include "archive/QuickArchive.hpp"
+#include "archive/Record.hpp"
+
+#include <gtest/gtest.h>
+
+#include <array>
+#include <cstring>
+#include <sstream>
+#include <vector>
+
+using namespace OrvexKavorCore;
+
+namespace {
+
+std::vector<std::uint8_t> bytesOf(QuickArchive& ar) {
+    std::vector<std::uint8_t> out(ar.writePosition());
+    QuickArchive copy = ar;
+    copy.getRaw(out.data(), out.size());
+    return out;
+}
+
+QuickArchive archiveOver(const std::vector<std::uint8_t>& bytes) { return QuickArchive(bytes.data(), bytes.size()); }
+
+} // namespace
+
+TEST(Archive, PrimitivesAreLittleEndianAndPacked) {
+    QuickArchive ar;
+    ar.write(Transform{Matrix::identity(), Vector{1, 2, 3}});
+    ar.write(VersionWord::make(0, 3));
+    ar.write(true);
+    ar.write(std::int32_t{-2});
+    ar.write(1.0);
+    const auto bytes = bytesOf(ar);
+    ASSERT_EQ(bytes.size(), 48u + 4 + 1 + 4 + 8);
+
+    const float expected[12] = {1, 0, 0, 0, 1, 0, 0, 0, 1, 1, 2, 3};
+    EXPECT_EQ(std::memcmp(bytes.data(), expected, 48), 0);
+    EXPECT_EQ((std::vector<std::uint8_t>(bytes.begin(), bytes.begin() + 4)),
+              (std::vector<std::uint8_t>{0x00, 0x00, 0x80, 0x3F})); // 1.0f
+    EXPECT_EQ((std::vector<std::uint8_t>(bytes.begin() + 48, bytes.begin() + 53)),
+              (std::vector<std::uint8_t>{0x00, 0x00, 0x03, 0x00, 0x01}));
+    EXPECT_EQ((std::vector<std::uint8_t>(bytes.begin() + 53, bytes.begin() + 57)),
+              (std::vector<std::uint8_t>{0xFE, 0xFF, 0xFF, 0xFF}));
+
+    QuickArchive back = archiveOver(bytes);
+    EXPECT_EQ(back.get<Transform>(), (Transform{Matrix::identity(), Vector{1, 2, 3}}));
+    EXPECT_EQ(back.get<VersionWord>(), VersionWord::make(0, 3));
+    EXPECT_TRUE(back.get<bool>());
+    EXPECT_EQ(back.get<std::int32_t>(), -2);
+    EXPECT_EQ(back.get<double>(), 1.0);
+}
+
+TEST(Archive, VersionWordHalves) {
+    const VersionWord w = VersionWord::make(1, 23);
+    EXPECT_EQ(w.raw, 0x00170001u);
+    EXPECT_EQ(w.first(), 1);
+    EXPECT_EQ(w.second(), 23);
+}
+
+TEST(Archive, AnyNonZeroBoolByteReadsTrue) {
+    QuickArchive ar = archiveOver({0x00, 0x01, 0x02, 0xFF});
+    EXPECT_FALSE(ar.get<bool>());
+    EXPECT_TRUE(ar.get<bool>());
+    EXPECT_TRUE(ar.get<bool>());
+    EXPECT_TRUE(ar.get<bool>());
+}
+
+TEST(Archive, StringsAreCutAtTheirFirstNul) {
+    QuickArchive ar = archiveOver({0, 0, 0, 0, 4, 0, 0, 0, 'a', 'b', 0, 'c', 0x2A});
+    std::string s = "old";
+    ASSERT_TRUE(ar.readString(s));
+    EXPECT_EQ(s, "");
+    ASSERT_TRUE(ar.readString(s));
+    EXPECT_EQ(s, "ab");
+    EXPECT_EQ(ar.readPosition(), 12u);
+    EXPECT_EQ(ar.get<std::uint8_t>(), 0x2A);
+}
+
+TEST(Archive, WideStringsAreUtf8WithAWindows1252Fallback) {
+    QuickArchive ar;
+    ar.writeWString("Caf\xC3\xA9 \xE2\x82\xAC");      // "Café €"
+    ar.writeString("Caf\xE9 \x80");                     // the same in Windows-1252
+    ar.writeWString(std::string("cut\0here", 8));       // stored up to its NUL
+    ar.writeWString("\xFF\xFE not UTF-8");              // not storable: written empty
+    const auto bytes = bytesOf(ar);
+    EXPECT_EQ(bytes[0], 9u); // UTF-8 length
+
+    QuickArchive back = archiveOver(bytes);
+    std::string s;
+    ASSERT_TRUE(back.readWString(s));
+    EXPECT_EQ(s, "Caf\xC3\xA9 \xE2\x82\xAC");
+    ASSERT_TRUE(back.readWString(s));
+    EXPECT_EQ(s, "Caf\xC3\xA9 \xE2\x82\xAC");
+    ASSERT_TRUE(back.readWString(s));
+    EXPECT_EQ(s, "cut");
+    ASSERT_TRUE(back.readWString(s));
+    EXPECT_EQ(s, "");
+}
+
+TEST(Archive, ChunksGrowByOneAndSaveWhole) {
+    QuickArchive empty(1);
+    std::ostringstream emptyImage;
+    empty.save(emptyImage);
+    EXPECT_EQ(emptyImage.str().size(), 4u + 4096u);
+
+    QuickArchive ar(1);
+    for (int i = 0; i < 4097; ++i) ar.putByte(static_cast<std::uint8_t>(i));
+    EXPECT_EQ(ar.chunkCount(), 2u);
+    std::ostringstream out;
+    ar.save(out);
+    const std::string image = out.str();
+    ASSERT_EQ(image.size(), 4u + 8192u);
+    EXPECT_EQ(image.substr(0, 4), std::string("\x02\x00\x00\x00", 4));
+
+    // After loading, the write position is 0 and reading crosses chunk boundaries.
+    std::istringstream in(image);
+    QuickArchive loaded(1);
+    ASSERT_TRUE(loaded.load(in));
+    EXPECT_EQ(loaded.writePosition(), 0u);
+    loaded.skip(4094);
+    std::uint8_t b[3] = {};
+    EXPECT_TRUE(loaded.getRaw(b, 3));
+    EXPECT_EQ(b[0], static_cast<std::uint8_t>(4094));
+    EXPECT_EQ(b[2], static_cast<std::uint8_t>(4096));
+}
+
+TEST(Archive, LoadRejectsTruncatedAndOversizedImages) {
+    for (const std::string& image : {std::string("\x01\x00", 2), std::string("\x01\x00\x00\x00", 4) + "short",
+                                    std::string("\xFF\xFF\xFF\xFF", 4), std::string("\x00\x00\x10\x00", 4)}) {
+        std::istringstream in(image);
+        QuickArchive ar;
+        EXPECT_FALSE(ar.load(in));
+        EXPECT_TRUE(ar.failed());
+    }
+}
+
+TEST(Archive, ReadsPastTheEndKeepTheDestination) {
+    QuickArchive ar = archiveOver({1, 0, 0, 0});
+    ar.skip(4096); // past the only chunk
+    std::int32_t i = 77;
+    ar.read(i);
+    EXPECT_EQ(i, 77);
+    Color c{5, 5, 5};
+    ar.read(c); // compound values assemble into zeros
+    EXPECT_EQ(c, (Color{0, 0, 0}));
+    EXPECT_FALSE(ar.failed()); // a plain read past the end is not a failure
+}
+
+TEST(Archive, BytesBlocksHonourTheStrictnessFlag) {
+    QuickArchive ar;
+    std::array<std::uint8_t, 24> stored{};
+    for (std::size_t i = 0; i < stored.size(); ++i) stored[i] = static_cast<std::uint8_t>(i);
+    ar.writeBytes(stored.data(), 24);
+    ar.write(std::int32_t{99});
+
+    std::array<std::uint8_t, 12> buffer{};
+    QuickArchive lax = ar;
+    EXPECT_EQ(lax.readBytes(buffer.data(), 12, false), 24u);
+    EXPECT_EQ(buffer[11], 11);
+    EXPECT_EQ(lax.get<std::int32_t>(), 99); // the surplus was skipped
+
+    QuickArchive strict = ar;
+    EXPECT_EQ(strict.readBytes(buffer.data(), 12, true), 24u);
+    EXPECT_EQ(strict.readPosition(), 0u); // back at the count
+}
+
+TEST(Archive, CountsBeyondTheDataFailWithoutAllocating) {
+    // A count of 4,000,000,000 in a one-chunk archive.
+    QuickArchive ar = archiveOver({0x00, 0x28, 0x6B, 0xEE});
+    std::string s = "kept";
+    EXPECT_FALSE(ar.readString(s));
+    EXPECT_EQ(s, "kept");
+    ASSERT_TRUE(ar.failed());
+    EXPECT_EQ(ar.failure()->offset, 4u);
+    EXPECT_NE(ar.failure()->reason.find("4000000000"), std::string::npos);
+
+    QuickArchive block = archiveOver({0xFF, 0xFF, 0xFF, 0xFF});
+    std::uint8_t b[4];
+    EXPECT_FALSE(block.readBytes(b, 4, false).has_value());
+
+    EXPECT_TRUE(QuickArchive(1).canHold(4096 / 8, 8));
+    EXPECT_FALSE(QuickArchive(1).canHold(4096 / 8 + 1, 8));
+    EXPECT_FALSE(QuickArchive(1).canHold(std::uint64_t{1} << 62, 8));
+}
+
+TEST(Archive, FailuresKeepTheFirstReasonAndTheRecordPath) {
+    QuickArchive ar;
+    {
+        QuickArchive::Scope material(ar, "material", nullptr, 3);
+        QuickArchive::Scope layer(ar, "BRDF layer", nullptr, 2);
+        QuickArchive::Scope texture(ar, "texture", "color_tex");
+        ar.skip(10);
+        EXPECT_FALSE(ar.fail("unknown texture kind 41"));
+        EXPECT_FALSE(ar.fail("a later failure"));
+    }
+    ASSERT_TRUE(ar.failed());
+    EXPECT_EQ(ar.failure()->describe(),
+              "material 3 / BRDF layer 2 / texture color_tex: unknown texture kind 41 at offset 10");
+}
+
+TEST(Archive, NestingIsLimited) {
+    QuickArchive ar;
+    std::vector<std::unique_ptr<QuickArchive::Scope>> scopes;
+    for (unsigned i = 0; i < QuickArchive::kMaxNesting; ++i) {
+        scopes.push_back(std::make_unique<QuickArchive::Scope>(ar, "texture"));
+        ASSERT_TRUE(*scopes.back());
+    }
+    {
+        auto label = QuickArchive::Scope::label(ar, "a field"); // labels do not nest
+        EXPECT_TRUE(label);
+    }
+    QuickArchive::Scope tooDeep(ar, "texture");
+    EXPECT_FALSE(tooDeep);
+    EXPECT_TRUE(ar.failed());
+}
+
+namespace {
+
+struct Group {
+    std::int32_t on = 0;
+    float amount = 1.0f;
+};
+struct Block {
+    Group group;
+    Color color{0.5f, 0.5f, 0.5f};
+    std::string file;
+    std::uint32_t mode = 7;
+    bool flag = true;
+};
+
+constexpr std::array<record::Field<Block>, 6> kBlockFields = {
+    record::field<&Block::group, &Group::on>("group.on"),
+    record::discarded<Block, float>("legacy", record::between(1, 1)),
+    record::field<&Block::color>("color"),
+    record::field<&Block::group, &Group::amount>("group.amount", record::since(2)),
+    record::field<&Block::file>("file"),
+    record::field<&Block::mode>("mode", record::since(3)),
+};
+
+} // namespace
+
+TEST(RecordTable, ReadsAndWritesTheFieldsOfEachVersion) {
+    Block source;
+    source.group = {5, 2.5f};
+    source.color = {1, 2, 3};
+    source.file = "t\xC3\xBCr.png";
+    source.mode = 9;
+
+    QuickArchive ar;
+    ASSERT_TRUE(record::writeFields(ar, source, kBlockFields, 3));
+    EXPECT_EQ(ar.writePosition(), 4u + 12 + 4 + 4 + 8 + 4);
+    Block back;
+    ASSERT_TRUE(record::readFields(ar, back, kBlockFields, 3));
+    EXPECT_TRUE(record::fieldsEqual(source, back, kBlockFields));
+
+    // Version 1 holds a discarded float and neither the amount nor the mode.
+    QuickArchive old;
+    old.write(std::int32_t{4});
+    old.write(9.5f);
+    old.write(Color{1, 1, 1});
+    old.writeWString("x");
+    Block fromOld;
+    ASSERT_TRUE(record::readFields(old, fromOld, kBlockFields, 1));
+    EXPECT_EQ(fromOld.group.on, 4);
+    EXPECT_EQ(fromOld.group.amount, 1.0f);
+    EXPECT_EQ(fromOld.file, "x");
+    EXPECT_EQ(fromOld.mode, 7u);
+
+    fromOld.mode = 8;
+    EXPECT_STREQ(record::firstDifference(fromOld, Block{fromOld.group, fromOld.color, fromOld.file, 7, true},
+                                         kBlockFields),
+                 "mode");
+}
+
+TEST(RecordTable, AFailingFieldNamesItselfInTheFailure) {
+    QuickArchive ar;
+    ar.write(std::int32_t{1});
+    ar.write(Color{});
+    ar.write(1.0f);
+    ar.write(std::uint32_t{0xFFFFFFF0}); // the file name's length
+    Block back;
+    EXPECT_FALSE(record::readFields(ar, back, kBlockFields, 2));
+    ASSERT_TRUE(ar.failed());
+    EXPECT_EQ(ar.failure()->recordPath, "file");
+}

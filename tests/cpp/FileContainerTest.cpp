@@ -1,0 +1,236 @@
+// The framing of material library and render-options files, the pass-through of
+// files that are not binary, and saving without losing the previous file.
+#include "archive/Conversion.hpp"
+#include "archive/ZelMatFile.hpp"
+#include "archive/ZelOptFile.hpp"
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <sys/stat.h>
+
+using namespace OrvexKavorCore;
+namespace fs = std::filesystem;
+
+namespace {
+
+class TempDir {
+public:
+    TempDir() {
+        std::string pattern = (fs::temp_directory_path() / "dexmor-test-XXXXXX").string();
+        path_ = ::mkdtemp(pattern.data());
+    }
+    ~TempDir() {
+        std::error_code ec;
+        fs::remove_all(path_, ec);
+    }
+    fs::path file(const std::string& name, const std::string& content) const {
+        const fs::path p = path_ / name;
+        std::ofstream(p, std::ios::binary) << content;
+        return p;
+    }
+    const fs::path& path() const { return path_; }
+
+private:
+    fs::path path_;
+};
+
+std::string slurp(const fs::path& p) {
+    std::ifstream in(p, std::ios::binary);
+    return std::string(std::istreambuf_iterator<char>(in), {});
+}
+
+std::string header(std::uint16_t generation, std::uint32_t count, std::uint16_t first = 0) {
+    std::string h(8, '\0');
+    const VersionWord v = VersionWord::make(first, generation);
+    std::memcpy(h.data(), &v.raw, 4);
+    std::memcpy(h.data() + 4, &count, 4);
+    return h;
+}
+
+std::string archiveBytes(QuickArchive& ar) {
+    std::string out(ar.chunkCount() * QuickArchive::kChunkSize, '\0');
+    QuickArchive copy = ar;
+    copy.getRaw(out.data(), out.size());
+    return out;
+}
+
+// A material whose record always fails to write.
+class UnwritableMaterial : public BaseMaterial {
+public:
+    bool writeToArchive(QuickArchive&) override { return false; }
+    bool readFromArchive(QuickArchive&) override { return false; }
+    std::int32_t kindId() const override { return kLayeredBRDF; }
+    void resetToDefaults() override {}
+    MaterialPtr cloneRenamed() const override { return {}; }
+    MaterialPtr clone() const override { return {}; }
+    bool isEqual(const MaterialPtr&) const override { return false; }
+};
+
+} // namespace
+
+TEST(MaterialFile, FramingOfTheThreeGenerations) {
+    const std::string run = "\x01\x0D\x0A\x02\x0D";
+    auto gen1 = ZelMatFile::readFraming(header(1, 1) + run);
+    auto gen2 = ZelMatFile::readFraming(header(2, 1) + run);
+    ASSERT_TRUE(gen1 && gen2);
+    EXPECT_EQ(gen1->generation, 1);
+    EXPECT_EQ(gen1->count, 1u);
+    // Generation 1 loses every 0x0D byte, wherever it stands; generation 2 keeps them.
+    EXPECT_EQ(archiveBytes(gen1->archive).substr(0, 4), std::string("\x01\x0A\x02\x00", 4));
+    EXPECT_EQ(archiveBytes(gen2->archive).substr(0, 5), run);
+    EXPECT_EQ(gen2->archive.writePosition(), 5u);
+
+    QuickArchive image(1);
+    image.write(std::int32_t{42});
+    std::ostringstream out;
+    image.save(out);
+    auto gen3 = ZelMatFile::readFraming(header(3, 1) + out.str());
+    ASSERT_TRUE(gen3);
+    EXPECT_EQ(gen3->archive.get<std::int32_t>(), 42);
+}
+
+TEST(MaterialFile, UnusableHeadersAreRejectedWithAReason) {
+    ReadFailure why;
+    EXPECT_FALSE(ZelMatFile::readFraming(header(3, 0), &why));
+    EXPECT_NE(why.reason.find("no materials"), std::string::npos);
+    EXPECT_FALSE(ZelMatFile::readFraming(header(3, 1, 1), &why)); // first half not 0
+    EXPECT_FALSE(ZelMatFile::readFraming(header(4, 1), &why));
+    EXPECT_FALSE(ZelMatFile::readFraming(header(0, 1), &why));
+    EXPECT_FALSE(ZelMatFile::readFraming("\x00\x00\x03", &why));
+    EXPECT_FALSE(ZelMatFile::readFraming(header(3, 1) + std::string("\x01\x00\x00\x00", 4) + "short", &why));
+    EXPECT_EQ(why.recordPath, "archive image");
+}
+
+TEST(MaterialFile, AFailedReadKeepsTheListAndSaysWhy) {
+    ZelMatFile file;
+    file.add(MaterialPtr(new UnwritableMaterial));
+    std::string body(4, '\0');
+    const std::int32_t unknownKind = 15;
+    std::memcpy(body.data(), &unknownKind, 4);
+    EXPECT_FALSE(file.readFromBytes(header(2, 1) + body + std::string(8, '\0')));
+    EXPECT_EQ(file.count(), 1u);
+    ASSERT_TRUE(file.lastReadFailure());
+    EXPECT_EQ(file.lastReadFailure()->describe(), "material 0: unknown material kind 15 at offset 4");
+
+    // A count of materials that cannot fit in the file fails before any is read.
+    EXPECT_FALSE(file.readFromBytes(header(2, 4000000000u) + std::string(16, '\0')));
+    EXPECT_NE(file.lastReadFailure()->reason.find("4000000000"), std::string::npos);
+}
+
+TEST(MaterialFile, LookUpByIndexAndName) {
+    ZelMatFile file;
+    for (const char* name : {"Oak", "\xC3\x89tain", "oak"}) {
+        MaterialPtr m(new UnwritableMaterial);
+        m->name = name;
+        file.add(m);
+    }
+    MaterialPtr found;
+    EXPECT_EQ(file.indexOf("OAK"), 0);
+    EXPECT_EQ(file.indexOf("\xC3\xA9tain"), -1); // non-ASCII case is not folded
+    EXPECT_TRUE(file.get("\xC3\x89TAIN", found));
+    EXPECT_FALSE(file.get(3, found));
+    std::vector<std::string> names;
+    file.names(names);
+    EXPECT_EQ(names.size(), 3u);
+}
+
+TEST(MaterialFile, AFailedSaveKeepsThePreviousFileAndComposesAMessage) {
+    TempDir dir;
+    const fs::path target = dir.file("library.zelmat", "previous content");
+    ZelMatFile file;
+    EXPECT_FALSE(file.save(target)); // an empty list cannot be written
+    MaterialPtr m(new UnwritableMaterial);
+    m->name = "Oak";
+    file.add(m);
+    EXPECT_FALSE(file.save(target));
+    EXPECT_EQ(file.lastError(), "An error has occurred while attempting to serialize \"Oak\" - aborting zelmat creation");
+    EXPECT_EQ(slurp(target), "previous content");
+    EXPECT_EQ(std::distance(fs::directory_iterator(dir.path()), fs::directory_iterator()), 1);
+}
+
+TEST(MaterialFile, OpenModeProbe) {
+    TempDir dir;
+    EXPECT_EQ(ZelMatFile::probeOpenMode(dir.path() / "missing.zelmat"), std::ios_base::in);
+    EXPECT_EQ(ZelMatFile::probeOpenMode(dir.file("a.zelmat", header(1, 1))), std::ios_base::in);
+    EXPECT_EQ(ZelMatFile::probeOpenMode(dir.file("b.zelmat", header(3, 1))), std::ios_base::in | std::ios_base::binary);
+}
+
+TEST(Conversion, ExtensionTest) {
+    EXPECT_TRUE(hasExtension("/a/b/lib.ZelMat", "zelmat"));
+    EXPECT_FALSE(hasExtension("/a/b/lib.zelmat.bak", "zelmat"));
+    EXPECT_FALSE(hasExtension("/a/b/lib.", "zelmat"));
+    EXPECT_FALSE(hasExtension("/a/b/lib", "zelmat"));
+    EXPECT_FALSE(hasExtension("/a/x.zelmat/lib", "zelmat")); // the dot of a directory runs on
+    EXPECT_EQ(fileKindOf("opts.ZELOPT"), FileKind::RenderOptions);
+    EXPECT_EQ(fileKindOf("lib.zelmat"), FileKind::MaterialLibrary);
+    EXPECT_FALSE(fileKindOf("readme.txt"));
+}
+
+TEST(Conversion, FilesThatAreNotBinaryPassThroughAsText) {
+    TempDir dir;
+    for (FileKind kind : {FileKind::MaterialLibrary, FileKind::RenderOptions}) {
+        const std::string ext = "." + std::string(extensionOf(kind));
+        EXPECT_EQ(convertToXml(kind, dir.file("x" + ext, "<Assets>\n")), "<Assets>\n");
+        EXPECT_EQ(convertToXml(kind, dir.file("e" + ext, "")), "");
+        EXPECT_EQ(convertToXml(kind, dir.file("n" + ext, std::string("ab\0cd", 5))), "ab");
+        EXPECT_EQ(convertToXml(kind, dir.file("w" + ext, "caf\xE9")), "caf\xC3\xA9");
+        EXPECT_EQ(convertToXml(kind, dir.path() / ("missing" + ext)), "");
+        EXPECT_EQ(convertToXml(kind, dir.path()), ""); // a directory cannot be opened
+        const fs::path fifo = dir.path() / ("fifo" + ext);
+        ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
+        EXPECT_EQ(convertToXml(kind, fifo), ""); // and must not block
+    }
+    // A binary library that does not read gives its bytes up to the first NUL.
+    EXPECT_EQ(convertToXml(FileKind::MaterialLibrary, dir.file("bin.zelmat", header(3, 0))), "");
+}
+
+namespace {
+
+// An object whose record is `size` bytes of a counter, read back and checked.
+class CountingRecord : public OrvexSerializable {
+public:
+    explicit CountingRecord(std::uint32_t size) : size_(size) {}
+    bool writeToArchive(QuickArchive& ar) override {
+        ar.write(size_);
+        for (std::uint32_t i = 0; i < size_; ++i) ar.putByte(static_cast<std::uint8_t>(i));
+        return true;
+    }
+    bool readFromArchive(QuickArchive& ar) override {
+        if (ar.get<std::uint32_t>() != size_) return ar.fail("wrong size");
+        for (std::uint32_t i = 0; i < size_; ++i)
+            if (ar.get<std::uint8_t>() != static_cast<std::uint8_t>(i)) return ar.fail("wrong byte");
+        return true;
+    }
+
+private:
+    std::uint32_t size_;
+};
+
+} // namespace
+
+TEST(OptionsFile, TheFileIsTheArchiveChunks) {
+    TempDir dir;
+    ZelOptFile file;
+    CountingRecord small(10), large(5000);
+    const fs::path a = dir.path() / "small.zelopt", b = dir.path() / "large.zelopt";
+    ASSERT_TRUE(file.writeFile(small, a));
+    ASSERT_TRUE(file.writeFile(large, b));
+    EXPECT_EQ(fs::file_size(a), 4096u);
+    EXPECT_EQ(fs::file_size(b), 8192u);
+    EXPECT_TRUE(file.readFile(small, a));
+    EXPECT_TRUE(file.readFile(large, b));
+
+    // Trailing chunks behind the record are ignored.
+    std::ofstream(a, std::ios::app | std::ios::binary) << std::string(4096, 'x');
+    EXPECT_TRUE(file.readFile(small, a));
+
+    EXPECT_FALSE(file.readFile(large, a));
+    ASSERT_TRUE(file.lastReadFailure());
+    EXPECT_EQ(file.lastReadFailure()->reason, "wrong size");
+    EXPECT_FALSE(file.readFile(small, dir.file("empty.zelopt", "")));
+    EXPECT_FALSE(file.readFile(small, dir.path() / "missing.zelopt"));
+}

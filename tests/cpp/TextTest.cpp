@@ -1,0 +1,46 @@
+// Text at the edges: validation of UTF-8, the Windows-1252 fallback, counting in
+// UTF-16 code units, and ASCII-only case folding.
+#include "platform/Text.hpp"
+
+#include <gtest/gtest.h>
+
+using namespace OrvexKavorCore::text;
+
+TEST(Text, StrictUtf8) {
+    EXPECT_TRUE(isValidUtf8(""));
+    EXPECT_TRUE(isValidUtf8("plain ASCII"));
+    EXPECT_TRUE(isValidUtf8("\xC3\xA9\xE2\x82\xAC\xF0\x9F\x98\x80")); // é € 😀
+    EXPECT_TRUE(isValidUtf8("\xF4\x8F\xBF\xBF"));                    // U+10FFFF
+    EXPECT_FALSE(isValidUtf8("\xC0\x80"));                            // overlong NUL
+    EXPECT_FALSE(isValidUtf8("\xE0\x80\xAF"));                        // overlong
+    EXPECT_FALSE(isValidUtf8("\xED\xA0\x80"));                        // a surrogate
+    EXPECT_FALSE(isValidUtf8("\xF4\x90\x80\x80"));                    // above U+10FFFF
+    EXPECT_FALSE(isValidUtf8("\xE2\x82"));                            // truncated
+    EXPECT_FALSE(isValidUtf8("\x80"));                                // stray continuation
+}
+
+TEST(Text, Windows1252Fallback) {
+    EXPECT_EQ(decodeStoredText("d\xC3\xA9j\xC3\xA0"), "d\xC3\xA9j\xC3\xA0"); // valid UTF-8 stays
+    EXPECT_EQ(decodeStoredText("d\xE9j\xE0"), "d\xC3\xA9j\xC3\xA0");         // é à in Windows-1252
+    EXPECT_EQ(windows1252ToUtf8("\x80\x99\x9F"), "\xE2\x82\xAC\xE2\x84\xA2\xC5\xB8");
+    // The five undefined bytes become the C1 controls of the same number.
+    EXPECT_EQ(windows1252ToUtf8("\x81\x8D\x8F\x90\x9D"), "\xC2\x81\xC2\x8D\xC2\x8F\xC2\x90\xC2\x9D");
+    EXPECT_EQ(latin1ToUtf8("a\xFF"), "a\xC3\xBF");
+}
+
+TEST(Text, Utf16CountingNeverSplitsACharacter) {
+    const std::string smile = "\xF0\x9F\x98\x80"; // one character, two UTF-16 units
+    EXPECT_EQ(utf16Length("ab\xC3\xA9" + smile), 5u);
+    EXPECT_EQ(truncateToUtf16Units("abc", 2), "ab");
+    EXPECT_EQ(truncateToUtf16Units("a" + smile, 2), "a"); // the pair would straddle the limit
+    EXPECT_EQ(truncateToUtf16Units("a" + smile, 3), "a" + smile);
+    EXPECT_EQ(truncateToUtf16Units("\xC3\xA9\xC3\xA9", 1), "\xC3\xA9");
+}
+
+TEST(Text, CaseFoldingCoversAsciiLettersOnly) {
+    EXPECT_TRUE(equalsIgnoringAsciiCase("ZelMat", "zelmat"));
+    EXPECT_FALSE(equalsIgnoringAsciiCase("\xC3\x89t\xC3\xA9", "\xC3\xA9t\xC3\xA9")); // É vs é
+    EXPECT_FALSE(equalsIgnoringAsciiCase("abc", "abcd"));
+    EXPECT_LT(compareIgnoringAsciiCase("Apple", "banana"), 0);
+    EXPECT_EQ(upToFirstNul(std::string_view("ab\0cd", 5)), "ab");
+}
