@@ -1,0 +1,199 @@
+// The Python extension module "Dexmor".
+//
+//   Dexmor.getZelmatXml(path) -> str   XML of a material library (".zelmat")
+//   Dexmor.getZeloptXml(path) -> str   XML of a render-options file (".zelopt")
+//   Dexmor.error                      raised when a path has the wrong extension
+//                                     or the conversion fails unexpectedly
+//
+// The module only handles arguments and results; the conversion itself is
+// OrvexKavorCore::convertToXml, which runs with the interpreter lock released.
+#define PY_SSIZE_T_CLEAN
+#include <Python.h>
+
+#include "archive/Conversion.hpp"
+#include "platform/Text.hpp"
+
+#include <cstring>
+#include <exception>
+#include <filesystem>
+#include <new>
+#include <string>
+#include <string_view>
+#include <utility>
+
+namespace {
+
+namespace core = OrvexKavorCore;
+
+// Dexmor.error. The module attribute holds one reference, this static another.
+PyObject* moduleError = nullptr;
+
+// An owned reference, released when it goes out of scope.
+class Ref {
+public:
+    explicit Ref(PyObject* object) : object_(object) {}
+    ~Ref() { Py_XDECREF(object_); }
+    Ref(const Ref&) = delete;
+    Ref& operator=(const Ref&) = delete;
+    PyObject* get() const { return object_; }
+    explicit operator bool() const { return object_ != nullptr; }
+
+private:
+    PyObject* object_;
+};
+
+struct Call {
+    core::FileKind kind;
+    const char* name;
+    const char* format; // "O:" + name, so argument errors name the function
+};
+
+constexpr Call zelmatCall{core::FileKind::MaterialLibrary, "getZelmatXml", "O:getZelmatXml"};
+constexpr Call zeloptCall{core::FileKind::RenderOptions, "getZeloptXml", "O:getZeloptXml"};
+
+// Raises Dexmor.error with a message that may not be valid UTF-8.
+void raiseModuleError(const char* message) noexcept {
+    PyObject* text = PyUnicode_DecodeUTF8(message, static_cast<Py_ssize_t>(std::strlen(message)), "replace");
+    if (!text) return; // the decoder has set its own exception
+    PyErr_SetObject(moduleError, text);
+    Py_DECREF(text);
+}
+
+// Turns a C++ exception into the matching Python exception. The interpreter
+// lock must be held.
+void raiseFromCxx(std::exception_ptr failure) noexcept {
+    try {
+        std::rethrow_exception(std::move(failure));
+    } catch (const std::bad_alloc&) {
+        PyErr_NoMemory();
+    } catch (const std::exception& error) {
+        raiseModuleError(error.what());
+    } catch (...) {
+        PyErr_SetString(moduleError, "the conversion failed for an unknown reason");
+    }
+}
+
+// The path argument as a str: the str itself, or what an os.PathLike's
+// __fspath__ returns. Bytes paths are not accepted. New reference, or nullptr
+// with an exception set.
+PyObject* pathAsText(PyObject* argument, const Call& call) {
+    if (PyUnicode_Check(argument)) {
+        Py_INCREF(argument);
+        return argument;
+    }
+    if (!PyBytes_Check(argument) && !PyByteArray_Check(argument) &&
+        PyObject_HasAttrString(reinterpret_cast<PyObject*>(Py_TYPE(argument)), "__fspath__")) {
+        PyObject* path = PyOS_FSPath(argument);
+        if (!path || PyUnicode_Check(path)) return path;
+        PyErr_Format(PyExc_TypeError, "%s() argument must be str or os.PathLike returning str, not %.200s returning %.200s",
+                     call.name, Py_TYPE(argument)->tp_name, Py_TYPE(path)->tp_name);
+        Py_DECREF(path);
+        return nullptr;
+    }
+    PyErr_Format(PyExc_TypeError, "%s() argument must be str or os.PathLike, not %.200s", call.name,
+                 Py_TYPE(argument)->tp_name);
+    return nullptr;
+}
+
+// The body of both calls. C++ exceptions leave it only while the interpreter
+// lock is held.
+PyObject* convertFile(PyObject* args, const Call& call) {
+    PyObject* argument = nullptr;
+    if (!PyArg_ParseTuple(args, call.format, &argument)) return nullptr;
+    const Ref text(pathAsText(argument, call));
+    if (!text) return nullptr;
+
+    // As open() does: a NUL would silently shorten the path the system sees.
+    const Py_ssize_t nul = PyUnicode_FindChar(text.get(), 0, 0, PyUnicode_GET_LENGTH(text.get()), 1);
+    if (nul == -2) return nullptr;
+    if (nul >= 0) {
+        PyErr_SetString(PyExc_ValueError, "embedded null character");
+        return nullptr;
+    }
+
+    // The file-system encoding with surrogate escapes, as open() encodes a str
+    // path, so a name that is not valid UTF-8 still reaches its file.
+    const Ref encoded(PyUnicode_EncodeFSDefault(text.get()));
+    if (!encoded) return nullptr;
+    std::string path(PyBytes_AS_STRING(encoded.get()), static_cast<std::size_t>(PyBytes_GET_SIZE(encoded.get())));
+
+    const std::string extension(core::extensionOf(call.kind));
+    if (!core::hasExtension(path, extension)) {
+        PyErr_Format(moduleError, "%s() expects a path ending in \".%s\" (in any letter case), got %R", call.name,
+                     extension.c_str(), text.get());
+        return nullptr;
+    }
+
+    std::string xml;
+    std::exception_ptr failure;
+    Py_BEGIN_ALLOW_THREADS
+    try {
+        xml = core::convertToXml(call.kind, std::filesystem::path(std::move(path)));
+    } catch (...) {
+        failure = std::current_exception();
+    }
+    Py_END_ALLOW_THREADS
+    if (failure) std::rethrow_exception(failure);
+
+    const std::string_view result = core::text::upToFirstNul(xml);
+    return PyUnicode_DecodeUTF8(result.data(), static_cast<Py_ssize_t>(result.size()), "strict");
+}
+
+PyObject* guardedConvertFile(PyObject* args, const Call& call) noexcept {
+    try {
+        return convertFile(args, call);
+    } catch (...) {
+        raiseFromCxx(std::current_exception());
+        return nullptr;
+    }
+}
+
+PyObject* getZelmatXml(PyObject*, PyObject* args) noexcept {
+    return guardedConvertFile(args, zelmatCall);
+}
+
+PyObject* getZeloptXml(PyObject*, PyObject* args) noexcept {
+    return guardedConvertFile(args, zeloptCall);
+}
+
+PyMethodDef methods[] = {
+    {"getZelmatXml", getZelmatXml, METH_VARARGS, "Gets the xml from a zelmat file."},
+    {"getZeloptXml", getZeloptXml, METH_VARARGS, "Gets the xml from a zelopt file."},
+    {nullptr, nullptr, 0, nullptr},
+};
+
+PyModuleDef moduleDefinition = {
+    PyModuleDef_HEAD_INIT,
+    "Dexmor", // m_name
+    nullptr,  // m_doc: the module has no docstring
+    -1,       // m_size: state lives in statics
+    methods,  // m_methods
+    nullptr,  // m_slots
+    nullptr,  // m_traverse
+    nullptr,  // m_clear
+    nullptr,  // m_free
+};
+
+} // namespace
+
+PyMODINIT_FUNC PyInit_Dexmor() {
+    PyObject* module = PyModule_Create(&moduleDefinition);
+    if (!module) return nullptr;
+
+    PyObject* error = PyErr_NewException("Dexmor.error", nullptr, nullptr);
+    if (!error) {
+        Py_DECREF(module);
+        return nullptr;
+    }
+    Py_INCREF(error); // the module attribute's reference; PyModule_AddObject takes it on success
+    if (PyModule_AddObject(module, "error", error) < 0) {
+        Py_DECREF(error);
+        Py_DECREF(error);
+        Py_DECREF(module);
+        return nullptr;
+    }
+    PyObject* previous = moduleError;
+    moduleError = error;
+    Py_XDECREF(previous);
+    return module;
+}

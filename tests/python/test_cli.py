@@ -1,0 +1,125 @@
+"""The dexmor command-line tool: what it writes, where, and its exit statuses."""
+import os
+import pathlib
+import re
+import subprocess
+
+import pytest
+
+import Dexmor
+
+CLI = os.path.abspath(os.environ["DEXMOR_CLI"]) if "DEXMOR_CLI" in os.environ else "dexmor"
+SOURCE_DIR = pathlib.Path(os.environ.get("DEXMOR_SOURCE_DIR", pathlib.Path(__file__).resolve().parents[2]))
+
+SAMPLES = {
+    "a.zelmat": b'<?xml version="1.0"?>\n<Assets>\n</Assets>\n',
+    "b.ZelOpt": "<Assets name='Grüße 🎨'/>".encode("utf-8"),
+    "c.zelmat": b"<Assets name='caf\xe9 \x80'/>",
+    "d.zelopt": b"<Assets/>\0after the nul",
+    "e.zelmat": b"",
+}
+
+
+def dexmor(*args, stdout=subprocess.PIPE, cwd=None):
+    return subprocess.run([CLI, *map(str, args)], stdout=stdout, stderr=subprocess.PIPE, cwd=cwd, timeout=60)
+
+
+def module_text(path):
+    call = Dexmor.getZelmatXml if str(path).lower().endswith(".zelmat") else Dexmor.getZeloptXml
+    return call(str(path))
+
+
+@pytest.fixture
+def samples(tmp_path):
+    for name, data in SAMPLES.items():
+        (tmp_path / name).write_bytes(data)
+    return [tmp_path / name for name in SAMPLES]
+
+
+def test_stdout_is_the_module_text_of_each_file_in_order(samples):
+    for order in (samples, samples[::-1]):
+        run = dexmor("xml", *order)
+        assert (run.returncode, run.stderr) == (0, b"")
+        assert run.stdout.decode("utf-8") == "".join(module_text(p) for p in order)
+
+
+@pytest.mark.parametrize("bad", ["notes.txt", "missing.zelmat", "folder.zelmat"])
+def test_file_not_converted_is_reported_and_the_rest_still_are(samples, tmp_path, bad):
+    (tmp_path / "notes.txt").write_bytes(b"<Assets/>")
+    (tmp_path / "folder.zelmat").mkdir()
+    run = dexmor("xml", samples[0], tmp_path / bad, samples[1])
+    assert run.returncode == 2
+    assert str(tmp_path / bad).encode() in run.stderr
+    assert run.stdout.decode("utf-8") == module_text(samples[0]) + module_text(samples[1])
+
+
+def test_double_dash_ends_options(tmp_path):
+    (tmp_path / "-o.zelmat").write_bytes(b"<Assets/>")
+    run = dexmor("xml", "--", "-o.zelmat", cwd=tmp_path)
+    assert (run.returncode, run.stdout) == (0, b"<Assets/>")
+
+
+@pytest.mark.parametrize("args", [["xml", "a.zelmat"], ["--help"]])
+def test_full_disk_on_stdout_is_a_failure(samples, args):
+    with open("/dev/full", "wb") as full:
+        run = dexmor(*args, stdout=full, cwd=samples[0].parent)
+    assert run.returncode == 1
+    assert b"No space left on device" in run.stderr
+
+
+@pytest.mark.parametrize("form", [["-o", "{}"], ["--output={}/"]])
+def test_output_directory_gets_one_document_per_file(samples, tmp_path, form):
+    out = tmp_path / "new" / "nested"
+    run = dexmor("xml", *[a.format(out) for a in form], *samples)
+    assert (run.returncode, run.stdout) == (0, b""), run.stderr
+    assert sorted(p.name for p in out.iterdir()) == sorted(p.name + ".xml" for p in samples)
+    for path in samples:
+        assert (out / (path.name + ".xml")).read_bytes().decode("utf-8") == module_text(path)
+
+
+def test_output_directory_that_is_a_file_fails(samples, tmp_path):
+    blocker = tmp_path / "taken"
+    blocker.write_bytes(b"keep me")
+    run = dexmor("xml", "-o", blocker, samples[0])
+    assert run.returncode == 1
+    assert str(blocker).encode() in run.stderr
+    assert blocker.read_bytes() == b"keep me"
+
+
+def test_two_files_with_one_output_name_do_not_overwrite_each_other(tmp_path):
+    first, second = tmp_path / "one" / "lib.zelmat", tmp_path / "two" / "lib.zelmat"
+    for path, text in ((first, b"<first/>"), (second, b"<second/>")):
+        path.parent.mkdir()
+        path.write_bytes(text)
+    run = dexmor("xml", "-o", tmp_path / "out", first, second)
+    assert run.returncode == 1
+    assert str(second).encode() in run.stderr
+    assert (tmp_path / "out" / "lib.zelmat.xml").read_bytes() == b"<first/>"
+    assert dexmor("xml", "-o", tmp_path / "out", first, first).returncode == 0
+
+
+@pytest.mark.parametrize(
+    "args",
+    [[], ["convert", "a.zelmat"], ["--frobnicate"], ["xml"], ["xml", "--frobnicate", "a.zelmat"],
+     ["xml", "a.zelmat", "-o"], ["xml", "-o", "d1", "-o", "d2", "a.zelmat"], ["xml", "-o", "", "a.zelmat"],
+     ["xml", "-o", "d1"]],
+)
+def test_usage_errors(tmp_path, args):
+    run = dexmor(*args, cwd=tmp_path)
+    assert (run.returncode, run.stdout) == (2, b"")
+    assert run.stderr.startswith(b"dexmor: ")
+    assert list(tmp_path.iterdir()) == []  # no output directory was made
+
+
+@pytest.mark.parametrize("args", [["--help"], ["-h"], ["xml", "--help"]])
+def test_help(args):
+    run = dexmor(*args)
+    assert run.returncode == 0
+    for word in ("xml", "-o DIR", ".zelmat", ".zelopt", "--version", "dexmor xml -o"):
+        assert word in run.stdout.decode()
+
+
+def test_version():
+    project = re.search(r"project\(Dexmor VERSION ([0-9.]+)", (SOURCE_DIR / "CMakeLists.txt").read_text())
+    run = dexmor("--version")
+    assert (run.returncode, run.stdout.decode()) == (0, f"dexmor {project.group(1)}\n")
