@@ -1,9 +1,15 @@
 #include "textures/BaseBitmap.hpp"
 
+#include "textures/BitmapBuffer.hpp"
+
+#include <boost/make_shared.hpp>
+
 namespace OrvexKavorCore {
 
 BitmapPtr createBitmap(std::int32_t kind) {
     switch (kind) {
+    case BaseBitmap::kBuffer:
+        return boost::make_shared<BitmapBuffer>();
     default:
         return {};
     }

@@ -1,0 +1,69 @@
+#include "textures/BitmapBuffer.hpp"
+
+#include "archive/QuickArchive.hpp"
+#include "platform/Text.hpp"
+#include "xml/AssetXmlWriter.hpp"
+
+#include <boost/make_shared.hpp>
+
+#include <array>
+
+namespace OrvexKavorCore {
+
+namespace {
+
+constexpr VersionWord kVersion = VersionWord::make(0, 1);
+
+constexpr std::array<std::string_view, 3> kFilterNames = {"No filter", "Mip-map", "Summed-area"};
+
+} // namespace
+
+std::string_view bitmapFilterName(std::int32_t filterType) {
+    if (filterType < 0 || static_cast<std::size_t>(filterType) >= kFilterNames.size()) return {};
+    return kFilterNames[static_cast<std::size_t>(filterType)];
+}
+
+bool BitmapBuffer::writeToArchive(QuickArchive& ar) {
+    ar.write(kVersion);
+    ar.write(filter_type);
+    ar.write(filter_blur);
+    ar.write(gamma);
+    ar.writeWString(file);
+    return true;
+}
+
+bool BitmapBuffer::readFromArchive(QuickArchive& ar) {
+    const auto version = ar.get<VersionWord>();
+    if (version != kVersion)
+        return ar.fail("unknown bitmap buffer version " + std::to_string(version.first()) + "." +
+                       std::to_string(version.second()));
+    ar.read(filter_type);
+    ar.read(filter_blur);
+    ar.read(gamma);
+    return ar.readWString(file);
+}
+
+void BitmapBuffer::resetToDefaults() { *this = BitmapBuffer{}; }
+
+BitmapPtr BitmapBuffer::clone() const { return boost::make_shared<BitmapBuffer>(*this); }
+
+bool BitmapBuffer::isEqual(const BitmapPtr& other) const {
+    const auto* o = dynamic_cast<const BitmapBuffer*>(other.get());
+    return o && text::equalsIgnoringAsciiCase(file, o->file) && filter_blur == o->filter_blur &&
+           filter_type == o->filter_type && gamma == o->gamma;
+}
+
+void BitmapBuffer::writeXml(AssetXmlWriter& writer, std::string url) {
+    writer.beginAsset(url, assetType(), "");
+    writer.beginPlugin(pluginType(), assetType());
+    writer.beginParameters();
+    writer.writeInteger("filter_type", filter_type);
+    writer.writeFloat("filter_blur", filter_blur);
+    writer.writeFloat("gamma", gamma);
+    writer.writeString("file", file);
+    writer.endParameters();
+    writer.endPlugin();
+    writer.endAsset();
+}
+
+} // namespace OrvexKavorCore
