@@ -1,0 +1,39 @@
+#include "options/OrvexVFBStampInfo.hpp"
+
+#include "archive/QuickArchive.hpp"
+
+namespace OrvexKavorCore {
+
+bool OrvexVFBStampInfo::writeToArchive(QuickArchive& ar) {
+    ar.write(VersionWord::make(0, kVersion));
+    ar.write(si_i1);
+    ar.write(si_i2);
+    ar.write(si_i3);
+    ar.writeWString(text);
+    ar.writeBytes(si_block.data(), static_cast<std::uint32_t>(si_block.size()));
+    return true;
+}
+
+bool OrvexVFBStampInfo::readFromArchive(QuickArchive& ar) {
+    resetToDefaults();
+    const auto version = ar.get<VersionWord>();
+    if (version.first() != 0 || version.second() < 1 || version.second() > kVersion)
+        return ar.fail("unknown stamp info version (" + std::to_string(version.first()) + ", " +
+                       std::to_string(version.second()) + ")");
+    ar.read(si_i1);
+    ar.read(si_i2);
+    ar.read(si_i3);
+    // The stored text replaces the default, also when it is empty.
+    if (!ar.readWString(text)) return false;
+    if (version.second() == 1) {
+        ar.getRaw(si_block.data(), si_block.size());
+        return true;
+    }
+    return ar.readBytes(si_block.data(), static_cast<std::uint32_t>(si_block.size()), false).has_value();
+}
+
+void OrvexVFBStampInfo::resetToDefaults() {
+    static_cast<KavorUtils::KavorVFBStampInfo&>(*this) = KavorUtils::KavorVFBStampInfo{};
+}
+
+} // namespace OrvexKavorCore

@@ -1,0 +1,564 @@
+// The blocks an options set owns: the renderer parameter block, the frame data and
+// the frame-buffer stamp. Records are assembled here from their row numbers, so a
+// field out of place in a record table shows up as a wrong value or wrong bytes.
+#include "archive/QuickArchive.hpp"
+#include "options/OrvexFrameData.hpp"
+#include "options/OrvexParams.hpp"
+#include "options/OrvexVFBStampInfo.hpp"
+#include "xml/AssetXmlWriter.hpp"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <array>
+#include <bit>
+#include <cmath>
+#include <cstring>
+#include <map>
+#include <random>
+#include <string>
+#include <vector>
+
+using namespace OrvexKavorCore;
+
+namespace {
+
+// The bytes written to the archive, wherever its read position stands.
+std::vector<std::uint8_t> bytesOf(const QuickArchive& ar) {
+    std::vector<std::uint8_t> out;
+    out.reserve(ar.writePosition());
+    for (const auto& chunk : ar.chunks()) out.insert(out.end(), chunk->begin(), chunk->end());
+    out.resize(ar.writePosition());
+    return out;
+}
+
+QuickArchive archiveOver(const std::vector<std::uint8_t>& bytes) { return QuickArchive(bytes.data(), bytes.size()); }
+
+// A 32-bit pattern that is not a NaN as a float (NaNs never compare equal).
+std::uint32_t randomWord(std::mt19937& rng) {
+    for (;;) {
+        const std::uint32_t w = rng();
+        if (!std::isnan(std::bit_cast<float>(w))) return w;
+    }
+}
+
+double randomDouble(std::mt19937& rng) {
+    for (;;) {
+        const std::uint64_t bits = (std::uint64_t{rng()} << 32) | rng();
+        const double d = std::bit_cast<double>(bits);
+        if (!std::isnan(d)) return d;
+    }
+}
+
+// Non-empty UTF-8 mixing one-, two-, three- and four-byte characters.
+std::string randomText(std::mt19937& rng) {
+    static const char* const pieces[] = {"a", "Z", "7", " ", "%", "\xC3\xA9", "\xC3\x9C", "\xE2\x82\xAC",
+                                         "\xE6\x97\xA5", "\xF0\x9F\x8E\xAC", "\\", "&", "<"};
+    std::string s;
+    const auto n = 1 + rng() % 12;
+    for (unsigned i = 0; i < n; ++i) s += pieces[rng() % std::size(pieces)];
+    return s;
+}
+
+// --- the parameter block's record, by row number ---
+
+constexpr int kParamRows = 173;
+constexpr std::array<int, 8> kTextRows = {69, 73, 89, 94, 104, 107, 122, 123};
+
+bool isTextRow(int row) { return std::find(kTextRows.begin(), kTextRows.end(), row) != kTextRows.end(); }
+
+// The first record version that holds the row.
+int sinceOf(int row) {
+    if (row >= 74 && row <= 77) return 5; // irradiance map detail
+    if (row == 140) return 2;             // DMC path sampler type
+    if (row == 144) return 3;             // subpixel mapping
+    if (row == 145) return 4;             // colour-mapping gamma
+    return 1;
+}
+
+// The stored values of one record: a 32-bit word per numeric row, a text per text row.
+struct ParamValues {
+    std::array<std::uint32_t, kParamRows + 1> words{};
+    std::map<int, std::string> texts;
+
+    float asFloat(int row) const { return std::bit_cast<float>(words[row]); }
+    std::int32_t asInt(int row) const { return static_cast<std::int32_t>(words[row]); }
+};
+
+ParamValues randomParamValues(std::mt19937& rng) {
+    ParamValues v;
+    for (int row = 1; row <= kParamRows; ++row) {
+        if (isTextRow(row))
+            v.texts[row] = randomText(rng);
+        else
+            v.words[row] = randomWord(rng);
+    }
+    return v;
+}
+
+// A record of `version` holding `v`, as the format lays it out.
+QuickArchive assembleParams(const ParamValues& v, std::uint16_t version) {
+    QuickArchive ar;
+    ar.write(VersionWord::make(0, version));
+    for (int row = 1; row <= kParamRows; ++row) {
+        if (row == 74 && version < 5) ar.write(-12345.5f); // read and dropped
+        if (sinceOf(row) > version) continue;
+        if (isTextRow(row)) {
+            auto it = v.texts.find(row);
+            ar.writeWString(it == v.texts.end() ? std::string() : it->second);
+        } else {
+            ar.write(v.words[row]);
+        }
+    }
+    return ar;
+}
+
+OrvexParams readParams(QuickArchive ar) {
+    OrvexParams p;
+    EXPECT_TRUE(p.readFromArchive(ar));
+    EXPECT_EQ(ar.readPosition(), ar.writePosition()); // the whole record, no more
+    return p;
+}
+
+// For failure messages: the first stored field that differs.
+std::string differenceOf(const OrvexParams& a, const OrvexParams& b) {
+    const char* name = a.firstDifference(b);
+    return name ? name : "no stored field";
+}
+
+void setUnstoredFields(KavorUtils::KavorParams& p) {
+    p.imageSampler.subdivision_show_samples = 1;
+    p.irradianceMap.interp_frames = 9;
+    p.irradianceMap.multiple_views = 1;
+    p.photonMap.show_calc_phase = 1;
+    p.lightCache.adaptive_dirs_only = 1;
+    p.lightCache.min_paths_per_sample = 3;
+    p.lightCache.multiple_views = 1;
+    p.caustics.show_calc_phase = 1;
+    p.raycaster.optLevel = 4;
+    p.colorMapping.adaptation_only = 1;
+    p.colorMapping.clamp_level = 0.25f;
+    p.colorMapping.linearWorkflow = 1;
+    p.options.geom_doHidden = 0;
+    p.options.mtl_filterMapsForSecondaryRays = 1;
+    p.options.geom_backfaceCull = 1;
+}
+
+} // namespace
+
+TEST(ParamsBlock, RandomRecordsReadAndWriteBackByteForByte) {
+    std::mt19937 rng(20240611);
+    for (int round = 0; round < 20; ++round) {
+        const ParamValues v = randomParamValues(rng);
+        QuickArchive stored = assembleParams(v, 5);
+        const OrvexParams p = readParams(stored);
+
+        // Values land in the fields their rows name.
+        EXPECT_EQ(p.imageFilter.on, v.asInt(1));
+        EXPECT_EQ(p.imageSampler.aux3, v.asFloat(16));
+        EXPECT_EQ(p.gi.primary_engine, v.words[45]);
+        EXPECT_EQ(p.irradianceMap.str1, v.texts.at(69));
+        EXPECT_EQ(p.irradianceMap.detail_radius, v.asFloat(75));
+        EXPECT_EQ(p.photonMap.auto_search_distance, v.asInt(85));
+        EXPECT_EQ(p.lightCache.str2, v.texts.at(107));
+        EXPECT_EQ(p.caustics.search_distance, v.asFloat(115));
+        EXPECT_EQ(p.caustics.str2, v.texts.at(123));
+        EXPECT_EQ(p.dmcSampler.path_sampler_type, v.asInt(140));
+        EXPECT_EQ(p.colorMapping.gamma, v.asFloat(145));
+        EXPECT_EQ(p.options.misc_lowThreadPriority, v.asInt(164));
+        EXPECT_EQ(p.defaultDisplacement.aux2, v.asInt(173));
+
+        OrvexParams copy = p;
+        QuickArchive written;
+        ASSERT_TRUE(copy.writeToArchive(written));
+        ASSERT_EQ(bytesOf(written), bytesOf(stored));
+
+        OrvexParams back;
+        ASSERT_TRUE(back.readFromArchive(written));
+        EXPECT_TRUE(back.isEqual(p)) << differenceOf(back, p);
+        EXPECT_TRUE(back.isIdentical(p));
+        QuickArchive rewritten;
+        ASSERT_TRUE(back.writeToArchive(rewritten));
+        EXPECT_EQ(bytesOf(rewritten), bytesOf(stored));
+    }
+}
+
+TEST(ParamsBlock, OlderVersionsKeepDefaultsForTheFieldsTheyLack) {
+    std::mt19937 rng(7);
+    const ParamValues v = randomParamValues(rng);
+    const OrvexParams newest = readParams(assembleParams(v, 5));
+
+    for (std::uint16_t version = 1; version <= 4; ++version) {
+        SCOPED_TRACE(version);
+        const OrvexParams old = readParams(assembleParams(v, version));
+
+        // Version 4's dropped Float32 stands where the four detail fields are.
+        EXPECT_EQ(old.irradianceMap.detail_enhancement, 0);
+        EXPECT_EQ(old.irradianceMap.detail_radius, 60.0f);
+        EXPECT_EQ(old.irradianceMap.detail_subdivs_mult, 0.3f);
+        EXPECT_EQ(old.irradianceMap.detail_scale, 0u);
+        EXPECT_EQ(old.dmcSampler.path_sampler_type, version >= 2 ? v.asInt(140) : 2);
+        EXPECT_EQ(old.colorMapping.subpixel_mapping, version >= 3 ? v.asInt(144) : 0);
+        EXPECT_EQ(old.colorMapping.gamma, version >= 4 ? v.asFloat(145) : 1.0f);
+
+        // Every other field as in the newest record.
+        OrvexParams expected = newest;
+        expected.irradianceMap.detail_enhancement = old.irradianceMap.detail_enhancement;
+        expected.irradianceMap.detail_radius = old.irradianceMap.detail_radius;
+        expected.irradianceMap.detail_subdivs_mult = old.irradianceMap.detail_subdivs_mult;
+        expected.irradianceMap.detail_scale = old.irradianceMap.detail_scale;
+        expected.dmcSampler.path_sampler_type = old.dmcSampler.path_sampler_type;
+        expected.colorMapping.subpixel_mapping = old.colorMapping.subpixel_mapping;
+        expected.colorMapping.gamma = old.colorMapping.gamma;
+        EXPECT_TRUE(old.isIdentical(expected)) << differenceOf(old, expected);
+    }
+}
+
+TEST(ParamsBlock, UnknownVersionsAreRejectedAndLeaveTheDefaults) {
+    std::mt19937 rng(11);
+    const ParamValues v = randomParamValues(rng);
+    for (const VersionWord word : {VersionWord::make(0, 6), VersionWord::make(0, 0), VersionWord::make(1, 5)}) {
+        QuickArchive ar = assembleParams(v, 5);
+        std::vector<std::uint8_t> bytes = bytesOf(ar);
+        std::memcpy(bytes.data(), &word.raw, 4);
+        QuickArchive patched = archiveOver(bytes);
+
+        OrvexParams p = readParams(assembleParams(v, 5)); // holds other values before
+        EXPECT_FALSE(p.readFromArchive(patched));
+        EXPECT_TRUE(p.isIdentical(OrvexParams{}));
+        ASSERT_TRUE(patched.failed());
+        EXPECT_EQ(patched.failure()->reason, "unknown parameter block version (" + std::to_string(word.first()) +
+                                                 ", " + std::to_string(word.second()) + ")");
+    }
+}
+
+TEST(ParamsBlock, FieldsTheRecordDoesNotHoldAlwaysReadBackAsDefaults) {
+    OrvexParams plain;
+    plain.gi.on = 1;
+    OrvexParams source = plain;
+    setUnstoredFields(source);
+
+    QuickArchive fromSource;
+    ASSERT_TRUE(source.writeToArchive(fromSource));
+    QuickArchive fromPlain;
+    ASSERT_TRUE(plain.writeToArchive(fromPlain));
+    EXPECT_EQ(bytesOf(fromSource), bytesOf(fromPlain));
+    EXPECT_TRUE(source.isEqual(plain)); // equal in everything the record holds
+    EXPECT_FALSE(source.isIdentical(plain));
+
+    OrvexParams target;
+    setUnstoredFields(target); // set before reading, reset by it
+    ASSERT_TRUE(target.readFromArchive(fromSource));
+    EXPECT_TRUE(target.isIdentical(plain));
+}
+
+TEST(ParamsBlock, TextFields) {
+    // No text is written as the empty WString (a zero count) and reads back as no text.
+    OrvexParams none;
+    QuickArchive ar;
+    ASSERT_TRUE(none.writeToArchive(ar));
+    const auto bytes = bytesOf(ar);
+    ASSERT_EQ(bytes.size(), 4u + 4u * kParamRows); // every row four bytes
+    for (int row : kTextRows)
+        EXPECT_EQ(std::vector<std::uint8_t>(bytes.begin() + 4 * row, bytes.begin() + 4 * row + 4),
+                  std::vector<std::uint8_t>(4, 0))
+            << "row " << row;
+    OrvexParams back;
+    back.lightCache.str1 = "something";
+    ASSERT_TRUE(back.readFromArchive(ar));
+    EXPECT_EQ(back.lightCache.str1, "");
+
+    // Within the record, an empty stored text leaves the field as it was; a
+    // non-empty one replaces it.
+    ParamValues v;
+    v.texts[104] = "\xE2\x82\xAC cache";
+    QuickArchive stored = assembleParams(v, 5);
+    stored.skip(4); // the version word
+    KavorUtils::KavorParams fields;
+    fields.irradianceMap.str1 = "kept";
+    fields.lightCache.str1 = "replaced";
+    ASSERT_TRUE(record::readFields(stored, fields, OrvexParams::recordFields(), 5));
+    EXPECT_EQ(fields.irradianceMap.str1, "kept");
+    EXPECT_EQ(fields.lightCache.str1, "\xE2\x82\xAC cache");
+
+    // A text whose count runs past the data fails the read and names the field.
+    std::vector<std::uint8_t> damaged = bytes;
+    const std::uint32_t huge = 0xFFFFFF00u;
+    std::memcpy(damaged.data() + 4 * 104, &huge, 4);
+    QuickArchive bad = archiveOver(damaged);
+    OrvexParams p;
+    EXPECT_FALSE(p.readFromArchive(bad));
+    ASSERT_TRUE(bad.failed());
+    EXPECT_EQ(bad.failure()->recordPath, "lightCache.str1");
+}
+
+TEST(ParamsBlock, OptionsSetOverridesAndNoAssetOfItsOwn) {
+    OrvexParams p;
+    p.lightCache.str1 = "a";
+    p.lightCache.str2 = "b";
+    p.lightCache.adaptive_sampling = 1;
+    p.applyOptionsSetOverrides();
+
+    OrvexParams expected;
+    expected.imageFilter.on = 1;
+    expected.imageSampler.type = 2;
+    expected.options.mtl_limitDepth = 1;
+    expected.caustics.search_distance = 20.0f; // the block's own default is 1e18
+    EXPECT_TRUE(p.isIdentical(expected)) << differenceOf(p, expected);
+
+    std::string xml;
+    AssetXmlWriter writer(xml);
+    p.writeXml(writer, "/x");
+    EXPECT_EQ(xml, "");
+}
+
+// --- frame data ---
+
+namespace {
+
+constexpr std::size_t kFrameDataBytes = 4 + 3 * 8 + 4 + 2 * 48 + 17 * 4 + 6 * 12 + 18 * 4;
+
+} // namespace
+
+TEST(FrameData, RandomRecordsReadAndWriteBackByteForByte) {
+    std::mt19937 rng(4711);
+    for (int round = 0; round < 20; ++round) {
+        // Three Float64, then 78 four-byte values (the transforms and colours are floats).
+        QuickArchive stored;
+        stored.write(VersionWord::make(0, 1));
+        std::array<double, 3> times{};
+        for (double& d : times) stored.write(d = randomDouble(rng));
+        std::array<std::uint32_t, 78> words{};
+        for (std::uint32_t& w : words) stored.write(w = randomWord(rng));
+        ASSERT_EQ(stored.writePosition(), kFrameDataBytes);
+        const auto f = [&](std::size_t i) { return std::bit_cast<float>(words[i]); };
+        const auto n = [&](std::size_t i) { return static_cast<std::int32_t>(words[i]); };
+
+        OrvexFrameData fd;
+        ASSERT_TRUE(fd.readFromArchive(stored));
+        EXPECT_EQ(fd.t, times[0]);
+        EXPECT_EQ(fd.frameEnd, times[2]);
+        EXPECT_EQ(fd.currentFrame, n(0));
+        EXPECT_EQ(fd.worldToCam, (Transform{{{{f(1), f(2), f(3)}, {f(4), f(5), f(6)}, {f(7), f(8), f(9)}}},
+                                            {f(10), f(11), f(12)}}));
+        EXPECT_EQ(fd.camToWorld.m[0].x, f(13));
+        EXPECT_EQ(fd.camToWorld.offs.z, f(24));
+        EXPECT_EQ(fd.fov, f(25));
+        EXPECT_EQ(fd.orthoAdjustToScene, n(41));
+        EXPECT_EQ(fd.ambient, (Color{f(42), f(43), f(44)}));
+        EXPECT_EQ(fd.background.r, f(45));
+        EXPECT_EQ(fd.globalLightLevel.r, f(48));
+        EXPECT_EQ(fd.kavorGIBackground.r, f(51));
+        EXPECT_EQ(fd.kavorRRBackground.r, f(54));
+        EXPECT_EQ(fd.kavorRefractBackground, (Color{f(57), f(58), f(59)}));
+        EXPECT_EQ(fd.rgn_left, f(60));
+        EXPECT_EQ(fd.r_height, n(71));
+        EXPECT_EQ(fd.firstField, n(75));
+        EXPECT_EQ(fd.bright_mult, f(77));
+
+        QuickArchive written;
+        ASSERT_TRUE(fd.writeToArchive(written));
+        ASSERT_EQ(bytesOf(written), bytesOf(stored));
+        OrvexFrameData back;
+        ASSERT_TRUE(back.readFromArchive(written));
+        EXPECT_TRUE(back.isEqual(fd)) << back.firstDifference(fd);
+    }
+}
+
+TEST(FrameData, UnknownVersionsAreRejectedAndLeaveTheDefaults) {
+    OrvexFrameData source;
+    source.fov = 1.0f;
+    QuickArchive ar;
+    ASSERT_TRUE(source.writeToArchive(ar));
+    std::vector<std::uint8_t> bytes = bytesOf(ar);
+    bytes[2] = 2; // VersionWord(0, 2)
+
+    QuickArchive patched = archiveOver(bytes);
+    OrvexFrameData fd = source;
+    EXPECT_FALSE(fd.readFromArchive(patched));
+    EXPECT_TRUE(fd.isEqual(OrvexFrameData{}));
+    ASSERT_TRUE(patched.failed());
+    EXPECT_EQ(patched.failure()->reason, "unknown frame data version (0, 2)");
+}
+
+TEST(FrameData, OwnAssetGolden) {
+    OrvexFrameData fd;
+    fd.t = 1.5;
+    fd.frameEnd = 250.0;
+    fd.currentFrame = -3;
+    fd.worldToCam = Transform{Matrix::identity(), Vector{1, 2, 3}};
+    fd.camToWorld = Transform{Matrix{{{0, 0, -1}, {0, 1, 0}, {1, 0, 0}}}, Vector{-1e6f, 0.5f, 2.5e-7f}};
+    fd.fov = 0.785398f;
+    fd.clippingPlanes = 1;
+    fd.clipFar = 1000.0f;
+    fd.ambient = Color{0.1f, 0.2f, 0.3f};
+    fd.kavorRefractBackground = Color{1, 0.5f, 0};
+    fd.focal_dist = 123.0f; // shown by the options set's sections, not here
+    fd.fieldMask = 2;
+
+    std::string xml;
+    AssetXmlWriter writer(xml);
+    fd.writeXml(writer, "/scene");
+    EXPECT_EQ(writer.depth(), 0u);
+
+    const auto scalar = [](const char* type, const char* name, const char* value) {
+        return std::string("          <parameter type=\"") + type + "\" name=\"" + name +
+               "\" listType=\"none\" label=\"" + name + "\">\n            <value>" + value +
+               "</value>\n          </parameter>\n";
+    };
+    const auto color = [](const char* name, const char* r, const char* g, const char* b) {
+        return std::string("          <parameter type=\"color\" name=\"") + name + "\" listType=\"none\" label=\"" +
+               name + "\">\n            <value>\n              <r>" + r + "</r>\n              <g>" + g +
+               "</g>\n              <b>" + b + "</b>\n            </value>\n          </parameter>\n";
+    };
+    const auto vec = [](const char* x, const char* y, const char* z) {
+        return std::string("              <vector>\n                <x>") + x + "</x>\n                <y>" + y +
+               "</y>\n                <z>" + z + "</z>\n              </vector>\n";
+    };
+    const auto transform = [](const char* name, const std::string& vectors) {
+        return std::string("          <parameter type=\"transform\" name=\"") + name +
+               "\" listType=\"none\" label=\"" + name + "\">\n            <value>\n" + vectors +
+               "            </value>\n          </parameter>\n";
+    };
+    const std::string expected =
+        "  <Asset layout=\"\" renderer=\"kavor\" type=\"settings\" url=\"/scene/FrameData\" >\n"
+        "    <plugin>\n"
+        "      <kavorplugin name=\"FrameData\" type=\"settings\">\n"
+        "        <parameters>\n" +
+        scalar("float", "t", "1.5") + scalar("float", "frameStart", "0") + scalar("float", "frameEnd", "250") +
+        scalar("integer", "currentFrame", "-3") +
+        transform("worldToCam", vec("1", "0", "0") + vec("0", "1", "0") + vec("0", "0", "1") + vec("1", "2", "3")) +
+        transform("camToWorld",
+                  vec("0", "0", "-1") + vec("0", "1", "0") + vec("1", "0", "0") + vec("-1e+006", "0.5", "2.5e-007")) +
+        scalar("float", "fov", "0.785398") + scalar("float", "nearRange", "0") + scalar("float", "farRange", "0") +
+        scalar("integer", "clippingPlanes", "1") + scalar("float", "clipNear", "0") +
+        scalar("float", "clipFar", "1000") + scalar("integer", "projType", "0") +
+        scalar("float", "zoomFractor", "1") + scalar("integer", "infiniteProj", "0") +
+        scalar("integer", "orthoAdjustToScene", "0") + color("ambient", "0.1", "0.2", "0.3") +
+        color("background", "0", "0", "0") + color("globalLightLevel", "0", "0", "0") +
+        color("kavorGIBackground", "0", "0", "0") + color("kavorRRBackground", "0", "0", "0") +
+        color("kavorRefractBackground", "1", "0.5", "0") + scalar("float", "devAspect", "1") +
+        scalar("integer", "fieldMask", "2") + scalar("integer", "fieldOrder", "0") +
+        scalar("integer", "firstField", "0") +
+        "        </parameters>\n"
+        "      </kavorplugin>\n"
+        "    </plugin>\n"
+        "  </Asset>\n";
+    EXPECT_EQ(xml, expected);
+}
+
+// --- stamp info ---
+
+namespace {
+
+std::array<std::uint8_t, 60> countingBlock(std::uint8_t first) {
+    std::array<std::uint8_t, 60> block{};
+    for (std::size_t i = 0; i < block.size(); ++i) block[i] = static_cast<std::uint8_t>(first + i);
+    return block;
+}
+
+// A stamp record up to its block: version word, the three integers and the text.
+QuickArchive stampHead(std::uint16_t version, const std::string& text) {
+    QuickArchive ar;
+    ar.write(VersionWord::make(0, version));
+    ar.write(std::int32_t{1});
+    ar.write(std::int32_t{2});
+    ar.write(std::int32_t{3});
+    ar.writeWString(text);
+    return ar;
+}
+
+constexpr std::int32_t kNextRecord = 0x5EC0DE;
+
+} // namespace
+
+TEST(StampInfo, NonAsciiTextAndBlockRoundTrip) {
+    OrvexVFBStampInfo stamp;
+    EXPECT_EQ(stamp.text, "Kavor Core %kavorcore | Render Time %rendertime |");
+    stamp.si_i1 = -1;
+    stamp.si_i3 = 70000;
+    stamp.text = "Rendu \xC3\xA0 %rendertime \xE2\x80\x94 \xE6\x97\xA5\xE6\x9C\xAC \xF0\x9F\x8E\xAC";
+    stamp.si_block = countingBlock(200);
+
+    QuickArchive ar;
+    ASSERT_TRUE(stamp.writeToArchive(ar));
+    const auto bytes = bytesOf(ar);
+    const std::size_t textBytes = stamp.text.size();
+    ASSERT_EQ(bytes.size(), 4 + 12 + 4 + textBytes + 4 + 60);
+    EXPECT_EQ(std::vector<std::uint8_t>(bytes.begin(), bytes.begin() + 4),
+              (std::vector<std::uint8_t>{0x00, 0x00, 0x02, 0x00}));
+    EXPECT_EQ(std::vector<std::uint8_t>(bytes.begin() + 20 + textBytes, bytes.begin() + 24 + textBytes),
+              (std::vector<std::uint8_t>{60, 0, 0, 0}));
+
+    OrvexVFBStampInfo back;
+    ASSERT_TRUE(back.readFromArchive(ar));
+    EXPECT_TRUE(back.isEqual(stamp));
+}
+
+TEST(StampInfo, VersionOneStoresTheBlockWithoutCount) {
+    QuickArchive ar = stampHead(1, ""); // an empty stored text replaces the default
+    const auto block = countingBlock(1);
+    ar.putRaw(block.data(), block.size());
+    ar.write(kNextRecord);
+
+    OrvexVFBStampInfo stamp;
+    ASSERT_TRUE(stamp.readFromArchive(ar));
+    EXPECT_EQ(stamp.si_i1, 1);
+    EXPECT_EQ(stamp.si_i2, 2);
+    EXPECT_EQ(stamp.si_i3, 3);
+    EXPECT_EQ(stamp.text, "");
+    EXPECT_EQ(stamp.si_block, block);
+    EXPECT_EQ(ar.get<std::int32_t>(), kNextRecord);
+}
+
+TEST(StampInfo, StoredBlockCountsOtherThanSixty) {
+    {
+        // 64 bytes: the first 60 are kept, 4 skipped, and the next record starts right.
+        QuickArchive ar = stampHead(2, "x");
+        std::array<std::uint8_t, 64> stored{};
+        for (std::size_t i = 0; i < stored.size(); ++i) stored[i] = static_cast<std::uint8_t>(i + 1);
+        ar.writeBytes(stored.data(), 64);
+        ar.write(kNextRecord);
+        OrvexVFBStampInfo stamp;
+        ASSERT_TRUE(stamp.readFromArchive(ar));
+        EXPECT_EQ(stamp.si_block, countingBlock(1));
+        EXPECT_EQ(ar.get<std::int32_t>(), kNextRecord);
+    }
+    {
+        // 10 bytes fill 10; the rest stays zero.
+        QuickArchive ar = stampHead(2, "x");
+        const auto block = countingBlock(1);
+        ar.writeBytes(block.data(), 10);
+        ar.write(kNextRecord);
+        OrvexVFBStampInfo stamp;
+        stamp.si_block = countingBlock(100);
+        ASSERT_TRUE(stamp.readFromArchive(ar));
+        std::array<std::uint8_t, 60> expected{};
+        std::copy_n(block.begin(), 10, expected.begin());
+        EXPECT_EQ(stamp.si_block, expected);
+        EXPECT_EQ(ar.get<std::int32_t>(), kNextRecord);
+    }
+    {
+        // A count beyond the data fails instead of reading on.
+        QuickArchive ar = stampHead(2, "x");
+        ar.write(std::uint32_t{0x7FFFFFFF});
+        OrvexVFBStampInfo stamp;
+        EXPECT_FALSE(stamp.readFromArchive(ar));
+        EXPECT_TRUE(ar.failed());
+    }
+}
+
+TEST(StampInfo, UnknownVersionsAreRejectedAndLeaveTheDefaults) {
+    for (const auto& [first, second] : {std::pair{0, 3}, std::pair{0, 0}, std::pair{1, 2}}) {
+        QuickArchive ar;
+        ar.write(VersionWord::make(static_cast<std::uint16_t>(first), static_cast<std::uint16_t>(second)));
+        ar.write(std::int32_t{5});
+        OrvexVFBStampInfo stamp;
+        stamp.text = "changed";
+        EXPECT_FALSE(stamp.readFromArchive(ar));
+        EXPECT_TRUE(stamp.isEqual(OrvexVFBStampInfo{}));
+        ASSERT_TRUE(ar.failed());
+        EXPECT_EQ(ar.failure()->reason,
+                  "unknown stamp info version (" + std::to_string(first) + ", " + std::to_string(second) + ")");
+    }
+}
