@@ -8,12 +8,15 @@ namespace OrvexKavorCore {
 
 namespace {
 
-// A matrix of one axis: its rotation, then its own column mirrored and scaled.
-// All arithmetic is in 32-bit floats.
+// pi as the 32-bit float 3.1415927; degrees to radians with one float division.
+constexpr float kPi = 3.1415927f;
+constexpr float kDegreesToRadians = kPi / 180.0f;
+
+// The matrix of one axis: the rotation about it, then its own column mirrored and
+// scaled. The angle is a 32-bit product; cosine and sine are taken in double
+// precision and rounded to 32 bits.
 Matrix axisMatrix(int axis, float degrees, float scale, bool mirror) {
-    constexpr float kPi = 3.1415927f;
-    const float k = kPi / 180.0f;
-    const float r = degrees * k;
+    const float r = degrees * kDegreesToRadians;
     const float c = static_cast<float>(std::cos(static_cast<double>(r)));
     const float s = static_cast<float>(std::sin(static_cast<double>(r)));
     Matrix m = Matrix::identity();
@@ -32,15 +35,25 @@ Matrix axisMatrix(int axis, float degrees, float scale, bool mirror) {
         break;
     }
     Vector& own = m[axis];
-    const float factor = (mirror ? -1.0f : 1.0f);
-    own = {own.x * factor, own.y * factor, own.z * factor};
+    if (mirror) own = {-own.x, -own.y, -own.z};
     own = {own.x * scale, own.y * scale, own.z * scale};
     return m;
 }
 
+// a0 * b0 + a1 * b1 + a2 * b2, summed left to right. Each product is rounded to
+// 32 bits on its own (separate statements: no fused multiply-add), so the result
+// is the same with every compiler.
+float dot(float a0, float b0, float a1, float b1, float a2, float b2) {
+    const float p0 = a0 * b0;
+    const float p1 = a1 * b1;
+    const float p2 = a2 * b2;
+    const float sum = p0 + p1;
+    return sum + p2;
+}
+
 Vector apply(const Matrix& a, const Vector& v) {
-    return {a[0].x * v.x + a[1].x * v.y + a[2].x * v.z, a[0].y * v.x + a[1].y * v.y + a[2].y * v.z,
-            a[0].z * v.x + a[1].z * v.y + a[2].z * v.z};
+    return {dot(a[0].x, v.x, a[1].x, v.y, a[2].x, v.z), dot(a[0].y, v.x, a[1].y, v.y, a[2].y, v.z),
+            dot(a[0].z, v.x, a[1].z, v.y, a[2].z, v.z)};
 }
 
 // Column j of A·B is A applied to column j of B.
@@ -48,7 +61,7 @@ Matrix multiply(const Matrix& a, const Matrix& b) { return Matrix{{apply(a, b[0]
 
 } // namespace
 
-bool TransformComponents::writeToArchive(QuickArchive& ar) {
+bool TransformComponents::writeRecord(QuickArchive& ar) const {
     ar.write(VersionWord::make(0, 1));
     for (float v : {x_rotation, y_rotation, z_rotation, x_scale, y_scale, z_scale, x_offset, y_offset, z_offset})
         ar.write(v);
@@ -57,7 +70,7 @@ bool TransformComponents::writeToArchive(QuickArchive& ar) {
 }
 
 bool TransformComponents::readFromArchive(QuickArchive& ar) {
-    *this = TransformComponents{};
+    resetToDefaults();
     const auto version = ar.get<VersionWord>();
     if (!version.is(0, 1)) return ar.fail("unknown transform components version");
     for (float* v : {&x_rotation, &y_rotation, &z_rotation, &x_scale, &y_scale, &z_scale, &x_offset, &y_offset,

@@ -1,6 +1,14 @@
 #pragma once
-// The editable form of a transform: rotations in degrees, scales, offsets and
-// mirror flags per axis.
+// The editable form of a transform: per axis a rotation in degrees, a scale, an
+// offset and a mirror flag. The transform itself is rebuilt from these with
+// buildTransform().
+//
+// Record:
+//   VersionWord (0, 1)
+//   Float32     x_rotation, y_rotation, z_rotation, x_scale, y_scale, z_scale,
+//               x_offset, y_offset, z_offset
+//   Int32       x_mirror, y_mirror, z_mirror
+#include "archive/Record.hpp"
 #include "archive/Serializable.hpp"
 #include "platform/KavorTypes.hpp"
 
@@ -15,13 +23,34 @@ public:
     float x_offset = 0.0f, y_offset = 0.0f, z_offset = 0.0f;
     std::int32_t x_mirror = 0, y_mirror = 0, z_mirror = 0;
 
-    bool writeToArchive(QuickArchive& ar) override;
+    bool writeToArchive(QuickArchive& ar) override { return writeRecord(ar); }
+    // Resets every field, then reads them; fails on any other version.
     bool readFromArchive(QuickArchive& ar) override;
+    // Appends the record; always succeeds.
+    bool writeRecord(QuickArchive& ar) const;
 
+    // Rotations 0, scales 1, offsets 0, no mirroring.
+    void resetToDefaults() { *this = TransformComponents{}; }
+
+    // (M_x · M_y) · M_z, where M_a rotates about axis a and then mirrors and scales
+    // its own column. Computed in 32-bit floats throughout (see the .cpp).
     Matrix buildMatrix() const;
+    // buildMatrix() with the offsets.
     Transform buildTransform() const;
 
+    // Exact comparison of the nine floats and the three flags.
     friend bool operator==(const TransformComponents& a, const TransformComponents& b);
+    friend bool operator!=(const TransformComponents& a, const TransformComponents& b) { return !(a == b); }
 };
+
+namespace record {
+// Components as their own record in a record table.
+template <>
+struct Codec<TransformComponents> {
+    static bool read(QuickArchive& ar, TransformComponents& value) { return value.readFromArchive(ar); }
+    static bool write(QuickArchive& ar, const TransformComponents& value) { return value.writeRecord(ar); }
+    static bool equal(const TransformComponents& a, const TransformComponents& b) { return a == b; }
+};
+} // namespace record
 
 } // namespace OrvexKavorCore
