@@ -1,5 +1,6 @@
 #pragma once
 // The light family. In stored files a light appears only as the sun of a sky texture.
+// The kinds are in lights/LightKinds.hpp and lights/SunLight.hpp.
 #include "archive/Members.hpp"
 #include "archive/Serializable.hpp"
 
@@ -7,6 +8,7 @@
 
 #include <cstdint>
 #include <string>
+#include <string_view>
 
 namespace OrvexKavorCore {
 
@@ -35,7 +37,13 @@ public:
 
 using LightPtr = boost::shared_ptr<BaseLight>;
 
+// A new light of the kind with its defaults; an empty pointer for an id without a
+// class (1, 8, negative ids and every id above 7).
 LightPtr createLight(std::int32_t kind);
+
+// The display name of a kind id 0 to 8 ("Omni Light"; 1 is "Positional Direct
+// Light", 8 "Invalid Light"); the empty text for any other id.
+std::string_view lightKindName(std::int32_t kind);
 
 template <>
 struct Family<BaseLight> {
