@@ -75,7 +75,10 @@ public:
     void endInlineValue();
     void writeText(std::string_view text) { out_.append(text); }
     void increaseDepth() { ++depth_; }
-    void decreaseDepth() { --depth_; }
+    // Never below 0: an unbalanced end must not wrap the depth into billions of spaces.
+    void decreaseDepth() {
+        if (depth_ > 0) --depth_;
+    }
 
     // --- typed parameters (an empty label repeats the name) ---
     void writeFloat(std::string_view name, float value, std::string_view label = {}, bool userData = false);
@@ -109,6 +112,7 @@ public:
     void writePlugin(std::string_view name, const boost::shared_ptr<BaseMaterial>& object, std::string_view path,
                      std::string_view label = {});
     // A sun light: the value is `url`, escaped (the url the sun map holds for it).
+    // An absent sun, like any absent object, writes the parameter without a value.
     void writeSunPlugin(std::string_view name, const boost::shared_ptr<BaseLight>& sun, std::string_view url,
                         std::string_view label = {});
     // A generic value holding a shared pointer of one of the families. A value of
@@ -130,6 +134,9 @@ private:
     void appendNarrow(std::string_view narrow);
     void inlineValue(std::string_view text);
     void floatLine(std::string_view tag, float value);
+    void integerLine(std::string_view tag, std::int32_t value);
+    void beginBlockParameter(std::string_view name, std::string_view type, std::string_view label);
+    void endBlockParameter();
     void vectorBlock(const Vector& v);
     void componentLines(const TransformComponents& c);
     void pluginReference(std::string_view name, std::string_view path, std::string_view last, bool escapeLast,

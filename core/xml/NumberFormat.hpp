@@ -12,6 +12,13 @@
 
 namespace OrvexKavorCore {
 
+// The longest text of a float ("-1.23456e-038").
+inline constexpr int kMaxFloatChars = 16;
+
+// Writes the float's text at `first`, which has room for kMaxFloatChars
+// characters, and returns the end of the text.
+char* formatFloatTo(char* first, float value);
+
 // Appends the float's text; no heap allocation beyond growing `out`.
 void appendFloat(std::string& out, float value);
 void appendInteger(std::string& out, std::int32_t value);

@@ -1,0 +1,86 @@
+// Numbers as the XML document writes them: %g with six significant digits, a
+// three-digit exponent, exact halves rounded away from zero.
+#include "xml/NumberFormat.hpp"
+
+#include <gtest/gtest.h>
+
+#include <bit>
+#include <cmath>
+#include <cstdint>
+#include <cstdio>
+#include <limits>
+#include <string>
+#include <utility>
+#include <vector>
+
+using namespace OrvexKavorCore;
+
+TEST(NumberFormat, Floats) {
+    using limits = std::numeric_limits<float>;
+    const std::vector<std::pair<float, const char*>> cases = {
+        {0.0f, "0"}, {-0.0f, "-0"}, {0.1f, "0.1"}, {0.5f, "0.5"}, {1.0f, "1"}, {-2.5f, "-2.5"},
+        {1.0f / 3.0f, "0.333333"}, {2.0f / 3.0f, "0.666667"}, {100000.0f, "100000"}, {999999.0f, "999999"},
+        {1e6f, "1e+006"}, {1234567.0f, "1.23457e+006"}, {0.0001f, "0.0001"}, {1e-5f, "1e-005"},
+        {2.5e-7f, "2.5e-007"}, {-3.75e-12f, "-3.75e-012"}, {1e20f, "1e+020"},
+        {limits::max(), "3.40282e+038"}, {-limits::max(), "-3.40282e+038"}, {limits::min(), "1.17549e-038"},
+        // Subnormals: six digits of their exact value.
+        {limits::denorm_min(), "1.4013e-045"}, {std::bit_cast<float>(0x007FFFFFu), "1.17549e-038"},
+        {1e-40f, "9.99995e-041"},
+        // Exactly halfway between two six-digit results: away from zero.
+        {0.0009765625f, "0.000976563"}, {1234.125f, "1234.13"}, {123456.5f, "123457"}, {-123456.5f, "-123457"},
+        {1.015625f, "1.01563"}, {12345650.0f, "1.23457e+007"}, {999999.5f, "1e+006"},
+        // Not halfway, although the shortest text of the float ends in a 5.
+        {1.000005f, "1.00001"}, {1.000045f, "1.00004"},
+        {limits::infinity(), "inf"}, {-limits::infinity(), "-inf"}, {limits::quiet_NaN(), "nan"},
+        {-limits::quiet_NaN(), "-nan"}, {std::bit_cast<float>(0xFFC00001u), "-nan"},
+    };
+    for (const auto& [value, text] : cases) EXPECT_EQ(formatFloat(value), text) << value;
+
+    std::string out = "<r>";
+    appendFloat(out, 0.25f);
+    appendInteger(out, -2147483647 - 1);
+    appendInteger(out, 2147483647);
+    EXPECT_EQ(out, "<r>0.25-21474836482147483647");
+}
+
+namespace {
+
+// An independent oracle, the C library: it rounds exact halves to even, so an
+// exact half (seen in the full expansion: seven digits, the last a 5) is
+// printed from the next double away from zero.
+std::string expectedText(float value) {
+    double d = value;
+    char text[256];
+    std::snprintf(text, sizeof text, "%.6e", std::fabs(d));
+    bool half = text[7] == '5';
+    if (half) std::snprintf(text, sizeof text, "%.150e", std::fabs(d));
+    for (int i = 8; half && text[i] != 'e'; ++i) half = text[i] == '0';
+    if (half) d = std::nextafter(d, std::copysign(INFINITY, d));
+    std::snprintf(text, sizeof text, "%.6g", d);
+    std::string s = text;
+    const auto e = s.find('e');
+    if (e != std::string::npos && s.size() - e - 2 < 3) s.insert(e + 2, 3 - (s.size() - e - 2), '0');
+    return s;
+}
+
+} // namespace
+
+TEST(NumberFormat, AgreesWithTheCLibraryOnSampledFloats) {
+    // Bit patterns spread over every exponent and both signs, and the floats
+    // around values that lie exactly halfway.
+    std::vector<float> values;
+    for (std::uint64_t bits = 0; bits < 0x100000000ull; bits += 65521)
+        values.push_back(std::bit_cast<float>(static_cast<std::uint32_t>(bits)));
+    for (float centre : {1.015625f, 1234.125f, 123456.5f, 0.0009765625f, 3.0517578e-5f, 8388607.5f, 999999.5f}) {
+        float f = centre;
+        for (int i = 0; i < 1000; ++i) f = std::nextafter(f, 0.0f);
+        for (int i = 0; i < 2000; ++i, f = std::nextafter(f, INFINITY)) values.push_back(f);
+    }
+    int mismatches = 0;
+    for (float value : values) {
+        if (!std::isfinite(value)) continue;
+        const std::string text = formatFloat(value), expected = expectedText(value);
+        if (text != expected && ++mismatches <= 10) ADD_FAILURE() << value << ": " << text << " vs " << expected;
+    }
+    EXPECT_EQ(mismatches, 0);
+}
