@@ -1,0 +1,84 @@
+#include "brdfs/Glass_BRDF.hpp"
+
+#include <array>
+
+namespace OrvexKavorCore {
+
+namespace {
+
+using B = Glass_BRDF;
+using record::between;
+using record::field;
+using record::since;
+
+constexpr std::array kFields = {
+    field<&B::color>("color"),
+    field<&B::fogColor>("fogColor"),
+    field<&B::ior>("ior"),
+    field<&B::ior2>("ior2"),
+    field<&B::cutoff>("cutoff"),
+    field<&B::fogColorMult>("fogColorMult"),
+    field<&B::glossiness>("glossiness"),
+    field<&B::extraInt>("extraInt"),
+    field<&B::subdivs>("subdivs"),
+    field<&B::affectShadows>("affectShadows"),
+    field<&B::affectAlpha>("affectAlpha"),
+    field<&B::transparencyTexMult>("transparencyTexMult", between(2, 4)),
+    field<&B::colorTexMult>("colorTexMult", since(5)),
+    field<&B::glossinessTexMult>("glossinessTexMult", since(2)),
+    field<&B::iorTexMult>("iorTexMult", since(2)),
+    brdf::pathItem<&B::transparencyTex>("transparencyTex path", between(2, 3)),
+    brdf::pathItem<&B::glossinessTex>("glossinessTex path", between(2, 3)),
+    brdf::pathItem<&B::iorTex>("iorTex path", between(2, 3)),
+    field<&B::translucencyOn>("translucencyOn", since(3)),
+    field<&B::thickness>("thickness", since(3)),
+    field<&B::scatterCoeff>("scatterCoeff", since(3)),
+    field<&B::scatterDirection>("scatterDirection", since(3)),
+    field<&B::translucencyTexMult>("translucencyTexMult", since(3)),
+    field<&B::translucency>("translucency", since(3)),
+    brdf::pathItem<&B::translucencyTex>("translucencyTex path", between(3, 3)),
+    brdf::textureItem<&B::transparencyTex>("transparencyTex", between(4, 4)),
+    brdf::textureItem<&B::colorTex>("colorTex", since(5)),
+    brdf::textureItem<&B::glossinessTex>("glossinessTex", since(4)),
+    brdf::textureItem<&B::iorTex>("iorTex", since(4)),
+    brdf::textureItem<&B::translucencyTex>("translucencyTex", since(4)),
+    field<&B::transparency>("transparency", since(5)),
+    field<&B::transparencyTexMult>("transparencyTexMult", since(5)),
+    brdf::textureItem<&B::transparencyTex>("transparencyTex", since(5)),
+    brdf::baseRecord<B>(since(6)),
+};
+
+constexpr std::array kParameters = {
+    brdf::value<&B::color>("color"),
+    brdf::value<&B::transparency>("transparency"),
+    brdf::value<&B::fogColor>("fog_color"),
+    brdf::value<&B::translucency>("translucency"),
+    brdf::flag<&B::affectShadows>("affect_shadows"),
+    brdf::flag<&B::affectAlpha>("affect_alpha"),
+    brdf::flag<&B::translucencyOn>("translucency_on"),
+    brdf::value<&B::ior>("ior"),
+    brdf::value<&B::fogColorMult>("fog_color_mult"),
+    brdf::value<&B::glossiness>("glossiness"),
+    brdf::value<&B::glossinessTexMult>("glossiness_tex_mult"),
+    brdf::value<&B::iorTexMult>("ior_tex_mult"),
+    brdf::value<&B::translucencyTexMult>("translucency_tex_mult"),
+    brdf::value<&B::scatterCoeff>("scatter_coeff"),
+    brdf::value<&B::scatterDirection>("scatter_direction"),
+    brdf::value<&B::thickness>("thickness"),
+    brdf::value<&B::transparencyTexMult>("transparency_tex_mult"),
+    brdf::value<&B::cutoff>("cutoff"),
+    brdf::value<&B::colorTexMult>("color_tex_mult"),
+    brdf::value<&B::subdivs>("subdivs"),
+    brdf::texture<&B::transparencyTex>("transparency_tex", "transparency_texture"),
+    brdf::texture<&B::colorTex>("color_tex", "color_texture"),
+    brdf::texture<&B::glossinessTex>("glossiness_tex", "glossy_texture"),
+    brdf::texture<&B::iorTex>("ior_texture", "ior_texture"),
+    brdf::texture<&B::translucencyTex>("translucency_tex", "translucency_texture"),
+};
+
+} // namespace
+
+std::span<const record::Field<Glass_BRDF>> Glass_BRDF::fields() { return kFields; }
+std::span<const brdf::Parameter<Glass_BRDF>> Glass_BRDF::parameters() { return kParameters; }
+
+} // namespace OrvexKavorCore

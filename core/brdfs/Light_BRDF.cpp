@@ -1,0 +1,45 @@
+#include "brdfs/Light_BRDF.hpp"
+
+#include <array>
+
+namespace OrvexKavorCore {
+
+namespace {
+
+using B = Light_BRDF;
+using record::between;
+using record::field;
+using record::since;
+
+constexpr std::array kFields = {
+    field<&B::color>("color"),
+    field<&B::transparency>("transparency", since(2)),
+    field<&B::intensity>("intensity"),
+    field<&B::extraFloat>("extraFloat", since(2)),
+    field<&B::colorTexMult>("colorTexMult", since(2)),
+    field<&B::transparencyTexMult>("transparencyTexMult"),
+    brdf::pathItem<&B::colorTex>("colorTex path", between(2, 2)),
+    brdf::pathItem<&B::transparencyTex>("transparencyTex path", between(1, 2)),
+    brdf::textureItem<&B::colorTex>("colorTex", since(3)),
+    brdf::textureItem<&B::transparencyTex>("transparencyTex", since(3)),
+    brdf::baseRecord<B>(since(4)),
+    field<&B::doubleSided>("doubleSided", since(5)),
+};
+
+constexpr std::array kParameters = {
+    brdf::value<&B::color>("color"),
+    brdf::value<&B::transparency>("transparency"),
+    brdf::value<&B::intensity>("intensity"),
+    brdf::value<&B::transparencyTexMult>("transparency_tex_mult"),
+    brdf::value<&B::colorTexMult>("color_tex_mult"),
+    brdf::flag<&B::doubleSided>("doubleSided"),
+    brdf::texture<&B::colorTex>("color_tex", "color_texture"),
+    brdf::texture<&B::transparencyTex>("transparency_tex", "transp_texture"),
+};
+
+} // namespace
+
+std::span<const record::Field<Light_BRDF>> Light_BRDF::fields() { return kFields; }
+std::span<const brdf::Parameter<Light_BRDF>> Light_BRDF::parameters() { return kParameters; }
+
+} // namespace OrvexKavorCore

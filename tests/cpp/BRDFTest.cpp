@@ -1,0 +1,432 @@
+// BRDF layers: the factory, every record version of every kind (assembled by hand
+// from random values), the Fresnel switch of the older reflection records,
+// comparison, copies and the XML assets.
+#include "TextureTestSupport.hpp"
+
+#include "brdfs/BRDFs.hpp"
+#include "textures/Textures.hpp"
+
+#include <boost/make_shared.hpp>
+#include <gtest/gtest.h>
+
+#include <array>
+#include <climits>
+#include <cstdint>
+#include <initializer_list>
+#include <random>
+#include <string>
+#include <string_view>
+
+using namespace OrvexKavorCore;
+using namespace texturetest;
+
+namespace {
+
+// A record of one version assembled field by field from random values, and the
+// layer that reading it must give: a new layer holding what the record holds.
+template <class B>
+struct Layout {
+    std::mt19937 rng;
+    bool textures;         // seed 0: every texture item absent, every path empty
+    std::int32_t legacyOn; // the Fresnel switch of the older reflection records
+    float legacyIor = 0.0f;
+    B expect;
+    Image image;
+
+    Layout(unsigned version, std::uint32_t seed) : rng(seed), textures(seed != 0), legacyOn(seed % 2 ? 7 : 0) {
+        image.version(0, static_cast<std::uint16_t>(version));
+    }
+    bool coin() { return rng() % 2 == 0; }
+    // Never zero, so that flipping any bit changes the value.
+    float real() { return std::uniform_real_distribution<float>(0.5f, 100.0f)(rng) * (coin() ? 1.0f : -1.0f); }
+    TexturePtr texture() {
+        if (!textures || coin()) return {};
+        switch (rng() % 3) {
+        case 0: return boost::make_shared<AColorTexture>(AColor{real(), real(), real(), real()});
+        case 1: return boost::make_shared<CheckerTexture>();
+        default: return makeBitmapTexture("maps/m\xC3\xA4p " + std::to_string(rng()) + ".png");
+        }
+    }
+
+    Layout& c(Color B::*m) {
+        expect.*m = Color{real(), real(), real()};
+        image.f32({(expect.*m).r, (expect.*m).g, (expect.*m).b});
+        return *this;
+    }
+    Layout& f(float B::*m) { image.f32({expect.*m = real()}); return *this; }
+    Layout& i(std::int32_t B::*m) { image.i32(expect.*m = static_cast<std::int32_t>(rng())); return *this; }
+    Layout& ior() { image.f32({legacyIor = 1.25f + real()}); return *this; }
+    Layout& on() { image.i32(legacyOn); return *this; }
+    Layout& tex(TexturePtr B::*m) {
+        const TexturePtr& t = expect.*m = texture();
+        image.flag(static_cast<bool>(t));
+        if (t) image.i32(t->kindId()).append(recordOf(*t));
+        return *this;
+    }
+    // A bitmap path, or an empty one for no texture.
+    Layout& path(TexturePtr B::*m) {
+        const std::string file = texture() ? "C:/maps/" + std::to_string(rng()) + ".png" : "";
+        image.text(file);
+        expect.*m = makeBitmapTexture(file);
+        return *this;
+    }
+    Layout& base() {
+        expect.name = "layer \xC3\xA9 " + std::to_string(rng());
+        expect.flag1 = coin(), expect.flag2 = coin(), expect.flag3 = coin();
+        image.version(0, 4).text(expect.name).flag(expect.flag1).flag(expect.flag2).flag(expect.flag3);
+        return *this;
+    }
+    void fresnel(TexturePtr B::*m) {
+        if (legacyOn == 0) return;
+        auto made = boost::make_shared<FresnelTexture>();
+        made->fresnel_ior = legacyIor;
+        expect.*m = made;
+    }
+};
+
+void diffuse(Layout<Diffuse_BRDF>& r, unsigned v) {
+    using B = Diffuse_BRDF;
+    r.c(&B::color).c(&B::transparency).f(&B::colorTexMult).f(&B::transparencyTexMult);
+    if (v == 1) r.path(&B::colorTex).path(&B::transparencyTex);
+    if (v >= 2) r.tex(&B::colorTex).tex(&B::transparencyTex);
+    if (v >= 3) r.base();
+}
+
+void glass(Layout<Glass_BRDF>& r, unsigned v) {
+    using B = Glass_BRDF;
+    r.c(&B::color).c(&B::fogColor).f(&B::ior).f(&B::ior2).f(&B::cutoff).f(&B::fogColorMult).f(&B::glossiness);
+    r.i(&B::extraInt).i(&B::subdivs).i(&B::affectShadows).i(&B::affectAlpha);
+    if (v >= 2) r.f(v >= 5 ? &B::colorTexMult : &B::transparencyTexMult).f(&B::glossinessTexMult).f(&B::iorTexMult);
+    if (v == 2 || v == 3) r.path(&B::transparencyTex).path(&B::glossinessTex).path(&B::iorTex);
+    if (v >= 3) r.i(&B::translucencyOn).f(&B::thickness).f(&B::scatterCoeff).f(&B::scatterDirection);
+    if (v >= 3) r.f(&B::translucencyTexMult).c(&B::translucency);
+    if (v == 3) r.path(&B::translucencyTex);
+    if (v >= 4) r.tex(v == 4 ? &B::transparencyTex : &B::colorTex);
+    if (v >= 4) r.tex(&B::glossinessTex).tex(&B::iorTex).tex(&B::translucencyTex);
+    if (v >= 5) r.c(&B::transparency).f(&B::transparencyTexMult).tex(&B::transparencyTex);
+    if (v >= 6) r.base();
+}
+
+void mirror(Layout<Mirror_BRDF>& r, unsigned v) {
+    using B = Mirror_BRDF;
+    r.c(&B::color).c(&B::transparency).f(&B::transparencyTexMult);
+    if (v <= 4) r.ior();
+    r.f(&B::cutoff);
+    if (v <= 4) r.on();
+    r.i(&B::extraInt);
+    if (v <= 2) r.path(&B::transparencyTex);
+    if (v == 2) r.f(&B::colorTexMult).path(&B::colorTex);
+    if (v >= 3) r.f(&B::colorTexMult).tex(&B::transparencyTex).tex(&B::colorTex);
+    if (v >= 4) r.base();
+    if (v <= 4) r.fresnel(&B::transparencyTex);
+}
+
+template <class B>
+void glossy(Layout<B>& r, unsigned v) {
+    r.c(&B::color).c(&B::transparency).f(&B::hilightGlossiness).f(&B::reflectionGlossiness);
+    if (v <= 5) r.ior();
+    r.f(&B::cutoff).i(&B::subdivs);
+    if (v <= 5) r.on();
+    r.i(&B::backSide).i(&B::extraInt);
+    if (v >= 2) r.f(&B::colorTexMult).f(&B::hilightGlossinessTexMult).f(&B::reflectionGlossinessTexMult);
+    if (v >= 6) r.f(&B::transparencyTexMult);
+    if (v == 2 || v == 3) r.path(&B::colorTex).path(&B::hilightGlossinessTex).path(&B::reflectionGlossinessTex);
+    if (v >= 4) r.tex(&B::colorTex).tex(&B::hilightGlossinessTex).tex(&B::reflectionGlossinessTex);
+    if (v >= 6) r.tex(&B::transparencyTex);
+    if (v >= 3) r.f(&B::anisotropy).f(&B::anisotropyRotation);
+    if (v >= 5) r.base();
+    if (v <= 5) r.fresnel(&B::transparencyTex);
+}
+
+void light(Layout<Light_BRDF>& r, unsigned v) {
+    using B = Light_BRDF;
+    if (v == 1) r.c(&B::color).f(&B::intensity).f(&B::transparencyTexMult).path(&B::transparencyTex);
+    if (v == 1) return;
+    r.c(&B::color).c(&B::transparency).f(&B::intensity).f(&B::extraFloat).f(&B::colorTexMult);
+    r.f(&B::transparencyTexMult);
+    if (v == 2) r.path(&B::colorTex).path(&B::transparencyTex);
+    if (v >= 3) r.tex(&B::colorTex).tex(&B::transparencyTex);
+    if (v >= 4) r.base();
+    if (v >= 5) r.i(&B::doubleSided);
+}
+
+// Calls check(layout, current version) for every kind.
+template <class Check>
+void forEveryKind(Check check) {
+    check(diffuse, 3);
+    check(glass, 6);
+    check(mirror, 5);
+    check(glossy<Phong_BRDF>, 6);
+    check(glossy<Blinn_BRDF>, 6);
+    check(light, 5);
+}
+
+// The layer class of a layout function.
+template <class B>
+B layerOf(void (*)(Layout<B>&, unsigned));
+
+template <class B>
+void expectSameBase(const Base_BRDF& read, const B& expect) {
+    EXPECT_EQ(read.name, expect.name);
+    EXPECT_EQ((std::array{read.flag1, read.flag2, read.flag3}), (std::array{expect.flag1, expect.flag2, expect.flag3}));
+}
+
+} // namespace
+
+TEST(BRDF, FactoryKindsAndDefaults) {
+    const std::pair<std::int32_t, const char*> kinds[] = {
+        {1, "BRDFRefraction"}, {2, "BRDFDiffuse"},     {4, "BRDFReflection"},
+        {8, "BRDFReflection"}, {16, "BRDFReflection"}, {32, "BRDFLight"}};
+    for (const auto& [kind, plugin] : kinds) {
+        const BRDFPtr layer = createBRDF(kind);
+        ASSERT_TRUE(layer) << kind;
+        EXPECT_EQ(layer->kindId(), kind);
+        EXPECT_EQ(layer->pluginType(), plugin);
+        EXPECT_EQ(layer->assetType(), "BRDF");
+        EXPECT_EQ(layer->name, plugin);
+        EXPECT_TRUE(layer->flag1 && !layer->flag2 && !layer->flag3);
+    }
+    for (std::int32_t kind : {0, 3, 6, 64, 128, -1, INT_MIN}) EXPECT_FALSE(createBRDF(kind)) << kind;
+
+    // Each reflection layer has a Fresnel transparency of its own, and so has its copy.
+    const auto mirror = boost::make_shared<Mirror_BRDF>();
+    ASSERT_TRUE(dynamic_cast<FresnelTexture*>(mirror->transparencyTex.get()));
+    EXPECT_NE(mirror->transparencyTex, Mirror_BRDF().transparencyTex);
+    EXPECT_TRUE(dynamic_cast<FresnelTexture*>(Phong_BRDF().transparencyTex.get()));
+    EXPECT_TRUE(dynamic_cast<FresnelTexture*>(Blinn_BRDF().transparencyTex.get()));
+    const BRDFPtr copy = mirror->clone();
+    auto& copied = static_cast<Mirror_BRDF&>(*copy).transparencyTex;
+    EXPECT_NE(copied, mirror->transparencyTex);
+    static_cast<FresnelTexture&>(*copied).fresnel_ior = 2.0f;
+    EXPECT_FALSE(copy->isEqual(mirror));
+}
+
+// Every version reads to the layer it holds (the fields it lacks at their
+// defaults, name and flags only with a base record; an absent transparency item
+// leaves no texture, although a new reflection layer has a Fresnel one); the
+// current one writes back byte for byte, and so do its copies.
+TEST(BRDFRecord, EveryVersionOfEveryKind) {
+    forEveryKind([](auto layout, unsigned current) {
+        using B = decltype(layerOf(layout));
+        for (unsigned v = 1; v <= current; ++v) {
+            for (std::uint32_t seed = 0; seed < 6; ++seed) {
+                Layout<B> r(v, seed);
+                layout(r, v);
+                SCOPED_TRACE(std::string(B::kInfo.what) + " version " + std::to_string(v) + " seed " +
+                             std::to_string(seed));
+                const BRDFPtr expect = boost::make_shared<B>(r.expect), read = createBRDF(B::kInfo.kind);
+                QuickArchive ar;
+                ASSERT_TRUE(readInto(*read, r.image.bytes, &ar)) << failureOf(ar);
+                EXPECT_TRUE(read->isEqual(expect));
+                expectSameBase(*read, r.expect);
+                if (v < current) continue;
+                EXPECT_EQ(recordOf(*read), r.image.bytes);
+                const BRDFPtr copy = read->clone();
+                EXPECT_TRUE(copy->isEqual(read));
+                EXPECT_EQ(recordOf(*copy), r.image.bytes);
+                EXPECT_EQ(xmlOf(*copy, "/M"), xmlOf(*read, "/M"));
+            }
+        }
+    });
+}
+
+// Changing any stored value outside the base record makes the layers unequal; the
+// name and the flags are not compared.
+TEST(BRDFRecord, ComparisonSeesEveryStoredValue) {
+    forEveryKind([](auto layout, unsigned current) {
+        using B = decltype(layerOf(layout));
+        Layout<B> r(current, 0);
+        layout(r, current);
+        const ByteVector& bytes = r.image.bytes;
+        const BRDFPtr original = boost::make_shared<B>(r.expect);
+        const std::size_t baseEnd = bytes.size() - (B::kInfo.kind == Base_BRDF::kLight ? 4 : 0);
+        const std::size_t baseBegin = baseEnd - 11 - r.expect.name.size();
+        std::size_t compared = 0;
+        for (std::size_t at = 0; at < bytes.size(); ++at) {
+            if (at >= baseBegin && at < baseEnd) continue;
+            ByteVector changed = bytes;
+            changed[at] ^= 1;
+            QuickArchive ar(changed.data(), changed.size());
+            const BRDFPtr read = createBRDF(B::kInfo.kind);
+            if (!read->readFromArchive(ar) || ar.readPosition() != changed.size()) continue; // a flag or version
+            ++compared;
+            EXPECT_FALSE(read->isEqual(original)) << B::kInfo.what << " byte " << at;
+        }
+        EXPECT_GE(compared + 20 + r.expect.name.size(), bytes.size()) << B::kInfo.what;
+
+        const BRDFPtr renamed = original->clone();
+        renamed->name = "other";
+        renamed->flag3 = !renamed->flag3;
+        EXPECT_TRUE(renamed->isEqual(original));
+        EXPECT_FALSE(original->isEqual(BRDFPtr()));
+    });
+
+    // Phong and Blinn hold the same fields yet are different kinds with the same XML.
+    Layout<Phong_BRDF> r(6, 1);
+    glossy(r, 6);
+    const BRDFPtr phong = boost::make_shared<Phong_BRDF>(r.expect), blinn = createBRDF(Base_BRDF::kBlinn);
+    ASSERT_TRUE(readInto(*blinn, r.image.bytes));
+    EXPECT_FALSE(blinn->isEqual(phong));
+    EXPECT_EQ(xmlOf(*blinn, "/M"), xmlOf(*phong, "/M"));
+}
+
+TEST(BRDFRecord, MirrorFresnelSwitch) {
+    // Version 1 with the switch on: a Fresnel texture of the stored index, whatever
+    // the path; with the switch off the path decides.
+    const auto mirrorV1 = [](std::int32_t on) {
+        Image image;
+        image.version(0, 1).f32({1, 1, 1, 1, 1, 1, 1, 1.6f, 0.01f}).i32(on).i32(1).text("C:/maps/a.png");
+        Mirror_BRDF mirror;
+        EXPECT_TRUE(readInto(mirror, image.bytes));
+        return mirror.transparencyTex;
+    };
+    const auto fresnel = boost::dynamic_pointer_cast<FresnelTexture>(mirrorV1(1));
+    ASSERT_TRUE(fresnel);
+    EXPECT_EQ(fresnel->fresnel_ior, 1.6f);
+    EXPECT_TRUE(mirrorV1(0)->isEqual(makeBitmapTexture("C:/maps/a.png")));
+}
+
+TEST(BRDFRecord, GlassKeepsItsFieldsThroughItsRead) {
+    Glass_BRDF layer;
+    layer.transparency = Color{0.25f, 0.5f, 0.75f};
+    layer.colorTex = boost::make_shared<AColorTexture>();
+    layer.name = "Old";
+    layer.flag1 = false;
+    Layout<Glass_BRDF> r(1, 1);
+    glass(r, 1);
+    ASSERT_TRUE(readInto(layer, r.image.bytes));
+    EXPECT_EQ(layer.ior, r.expect.ior);
+    EXPECT_EQ(layer.transparency, (Color{0.25f, 0.5f, 0.75f}));
+    EXPECT_TRUE(layer.colorTex);
+    expectSameBase(layer, Glass_BRDF());
+}
+
+TEST(BRDFRecord, RefusedRecordsSayWhy) {
+    const ByteVector diffuse = Image{}.f32({1, 1, 1, 0, 0, 0, 1, 1}).bytes;
+    const struct {
+        std::int32_t kind;
+        ByteVector bytes;
+        const char* reason;
+    } cases[] = {
+        {2, Image{}.version(0, 4).append(diffuse).bytes, "unknown diffuse BRDF version (0, 4)"},
+        {1, Image{}.version(1, 6).bytes, "unknown glass BRDF version (1, 6)"},
+        {2, Image{}.version(0, 3).append(diffuse).flag(true).i32(41).bytes,
+         "colorTex / texture: unknown texture kind 41"},
+        {2, Image{}.version(0, 2).append(diffuse).flag(false).flag(true).i32(-1).bytes,
+         "transparencyTex / texture: unknown texture kind -1"},
+        {32, Image{}.version(0, 5).f32({1, 1, 1, 0, 0, 0, 1, 1, 1, 1}).flag(true).i32(1).version(0, 9).bytes,
+         "unknown Fresnel texture version (0, 9)"},
+        {2, Image{}.version(0, 3).append(diffuse).flag(false).flag(false).version(0, 5).bytes,
+         "base record: unknown BRDF base record version (0, 5)"},
+        {2, Image{}.version(0, 1).append(diffuse).u32(50000).bytes, "a string of 50000 bytes"},
+    };
+    for (const auto& c : cases) {
+        const BRDFPtr layer = createBRDF(c.kind);
+        QuickArchive ar;
+        EXPECT_FALSE(readInto(*layer, c.bytes, &ar)) << c.reason;
+        EXPECT_NE(failureOf(ar).find(c.reason), std::string::npos) << failureOf(ar);
+    }
+}
+
+// --- XML ---
+
+namespace {
+
+std::string_view cut(std::string_view& text, char at) {
+    const auto end = text.find(at);
+    const std::string_view head = text.substr(0, end);
+    text = end == std::string_view::npos ? std::string_view{} : text.substr(end + 1);
+    return head;
+}
+
+// The exact text of one BRDF asset. `params` lists "type name value" entries
+// separated by "|"; a colour's value is "r g b", an absent texture has none.
+std::string assetText(const std::string& url, const char* plugin, std::string_view params) {
+    std::string s = "  <Asset layout=\"\" renderer=\"kavor\" type=\"BRDF\" url=\"" + url + "\" >\n    <plugin>\n" +
+                    "      <kavorplugin name=\"" + plugin + "\" type=\"BRDF\">\n        <parameters>\n";
+    while (!params.empty()) {
+        std::string_view value = cut(params, '|');
+        const std::string type(cut(value, ' ')), name(cut(value, ' '));
+        s += "          <parameter type=\"" + type + "\" name=\"" + name + "\" listType=\"none\" label=\"" + name +
+             "\">\n";
+        if (type == "color") {
+            s += "            <value>\n";
+            for (const char* c : {"r", "g", "b"})
+                s += std::string("              <") + c + ">" + std::string(cut(value, ' ')) + "</" + c + ">\n";
+            s += "            </value>\n";
+        } else if (!value.empty()) {
+            s += "            <value>" + std::string(value) + "</value>\n";
+        }
+        s += "          </parameter>\n";
+    }
+    return s + "        </parameters>\n      </kavorplugin>\n    </plugin>\n  </Asset>\n";
+}
+
+} // namespace
+
+// Each kind with one texture present and the others absent: the texture's asset
+// first, under the layer's url and the texture's suffix, then the layer's asset.
+TEST(BRDFXml, AssetsOfEveryKind) {
+    const TexturePtr tex = boost::make_shared<AColorTexture>(AColor{0.25f, 0.5f, 1.0f, 1.0f});
+    const auto texXml = [&](const std::string& url) { return xmlOf(*tex, url); };
+
+    Diffuse_BRDF diffuse;
+    diffuse.name = "A&B";
+    diffuse.colorTex = tex;
+    EXPECT_EQ(xmlOf(diffuse, "/Oak"),
+              texXml("/Oak/A&B/color_texture") +
+                  assetText("/Oak/A&amp;B", "BRDFDiffuse",
+                            "color color 0.5 0.5 0.5|color transparency 0 0 0|float color_tex_mult 1|"
+                            "float transparency_tex_mult 1|plugin color_tex /Oak/A&amp;B/color_texture/TexAColor|"
+                            "plugin transparency_tex"));
+
+    Glass_BRDF glass;
+    glass.colorTex = tex;
+    glass.affectAlpha = -2;
+    EXPECT_EQ(xmlOf(glass, "/M"),
+              texXml("/M/BRDFRefraction/color_texture") +
+                  assetText("/M/BRDFRefraction", "BRDFRefraction",
+                            "color color 1 1 1|color transparency 0 0 0|color fog_color 1 1 1|"
+                            "color translucency 1 1 1|bool affect_shadows 0|bool affect_alpha 1|"
+                            "bool translucency_on 0|float ior 1.55|float fog_color_mult 1|float glossiness 1|"
+                            "float glossiness_tex_mult 1|float ior_tex_mult 1|float translucency_tex_mult 1|"
+                            "float scatter_coeff 0|float scatter_direction 1|float thickness 1000|"
+                            "float transparency_tex_mult 1|float cutoff 0.001|float color_tex_mult 1|"
+                            "integer subdivs 8|plugin transparency_tex|"
+                            "plugin color_tex /M/BRDFRefraction/color_texture/TexAColor|plugin glossiness_tex|"
+                            "plugin ior_texture|plugin translucency_tex"));
+
+    Mirror_BRDF mirror;
+    mirror.transparencyTex.reset();
+    mirror.colorTex = tex;
+    EXPECT_EQ(xmlOf(mirror, "/M"),
+              texXml("/M/BRDFReflection/color_texture") +
+                  assetText("/M/BRDFReflection", "BRDFReflection",
+                            "color color 1 1 1|color transparency 1 1 1|float color_tex_mult 1|"
+                            "float transparency_tex_mult 1|float cutoff 0.01|plugin transparency_tex|"
+                            "plugin color_tex /M/BRDFReflection/color_texture/TexAColor"));
+
+    // Phong and Blinn: the default Fresnel transparency present, the others absent.
+    Phong_BRDF phong;
+    const std::string glossyXml =
+        xmlOf(*phong.transparencyTex, "/M/BRDFReflection/transparency_texture") +
+        assetText("/M/BRDFReflection", "BRDFReflection",
+                  "color color 1 1 1|color transparency 1 1 1|float hilightGlossiness 1|"
+                  "float reflectionGlossiness 1|float cutoff 0.01|integer subdivs 8|integer back_side 0|"
+                  "float color_tex_mult 1|float hilightGlossiness_tex_mult 1|float reflectionGlossiness_tex_mult 1|"
+                  "float transparency_tex_mult 1|float anisotropy 0|float anisotropy_rotation 0|plugin color_tex|"
+                  "plugin hilightGlossiness_tex|plugin reflectionGlossiness_tex|"
+                  "plugin transparency_tex /M/BRDFReflection/transparency_texture/TexFresnel");
+    EXPECT_EQ(xmlOf(phong, "/M"), glossyXml);
+    Blinn_BRDF blinn;
+    EXPECT_EQ(xmlOf(blinn, "/M"), glossyXml);
+
+    Light_BRDF light;
+    light.transparencyTex = tex;
+    EXPECT_EQ(xmlOf(light, "/M"),
+              texXml("/M/BRDFLight/transp_texture") +
+                  assetText("/M/BRDFLight", "BRDFLight",
+                            "color color 1 1 1|color transparency 0 0 0|float intensity 1|"
+                            "float transparency_tex_mult 1|float color_tex_mult 1|bool doubleSided 1|"
+                            "plugin color_tex|plugin transparency_tex /M/BRDFLight/transp_texture/TexAColor"));
+}
