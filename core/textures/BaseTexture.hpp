@@ -1,6 +1,8 @@
 #pragma once
 // The texture family: shading inputs that may own UVW generators, bitmaps, other
-// textures and (the sky) a sun light.
+// textures and (the sky) a sun light. Textures form trees; every walk over a tree
+// (reading, writing, XML, copying, comparing, inverting, destroying) is bounded so
+// that a very deep tree cannot overflow the stack.
 #include "archive/Members.hpp"
 #include "archive/Serializable.hpp"
 
@@ -8,6 +10,7 @@
 
 #include <cstdint>
 #include <string>
+#include <vector>
 
 namespace OrvexKavorCore {
 
@@ -28,13 +31,42 @@ public:
         kRamp = 11,
         kSky = 12,
     };
+    static constexpr std::int32_t kKindCount = 13;
 
     virtual void resetToDefaults() = 0;
     virtual std::int32_t kindId() const = 0;
+    // The deep copy: member objects are copied too. Empty only for a texture nested
+    // deeper than the walk limit.
     virtual boost::shared_ptr<BaseTexture> clone() const = 0;
+    // Same kind and same content, members compared by their own isEqual.
     virtual bool isEqual(const boost::shared_ptr<BaseTexture>& other) const = 0;
 
     std::string assetType() const override { return "texture"; }
+
+    // One level of a recursive walk over a texture tree, counted per thread. A
+    // level beyond the archive's nesting limit is refused (the guard is false):
+    // the walk then stops there (a write fails, a comparison is false, a copy or
+    // an XML asset stops at that level) instead of overflowing the stack.
+    class Descent {
+    public:
+        Descent();
+        ~Descent();
+        Descent(const Descent&) = delete;
+        Descent& operator=(const Descent&) = delete;
+        explicit operator bool() const { return ok_; }
+
+    private:
+        bool ok_;
+    };
+
+protected:
+    // Moves the texture members of this object into `out`. Kinds that hold
+    // textures override it.
+    virtual void takeTextureMembers(std::vector<boost::shared_ptr<BaseTexture>>& out) { (void)out; }
+    // Releases the texture members one by one instead of recursively, so that
+    // destroying a chain of any depth takes constant stack. Every kind that holds
+    // textures calls it from its destructor.
+    void releaseTextureMembers() noexcept;
 };
 
 using TexturePtr = boost::shared_ptr<BaseTexture>;
