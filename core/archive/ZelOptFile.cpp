@@ -1,7 +1,10 @@
 #include "archive/ZelOptFile.hpp"
 
+#include "options/AllOptions.hpp"
 #include "platform/FileIo.hpp"
 #include "platform/Text.hpp"
+#include "textures/SkyTexture.hpp"
+#include "xml/AssetXmlWriter.hpp"
 
 #include <string_view>
 
@@ -36,10 +39,20 @@ bool ZelOptFile::readFile(OrvexSerializable& object, const std::filesystem::path
 }
 
 std::string ZelOptFile::toXml(const std::filesystem::path& path) {
+    // Every conversion starts from a pristine default sun (sky textures share it).
+    resetSharedDefaultSun();
+    AllOptions options;
+    if (readFile(options, path)) {
+        std::string xml;
+        AssetXmlWriter writer(xml);
+        writer.beginDocument();
+        options.writeXml(writer, "");
+        writer.endDocument();
+        return xml;
+    }
+    // Not a binary options file: the file is taken to be XML text already.
     const std::optional<std::string> bytes = readRegularFile(path);
     if (!bytes) return {};
-    // The options set's conversion arrives with the options model; until then every
-    // file is taken to be XML text already.
     return text::decodeStoredText(text::upToFirstNul(*bytes));
 }
 

@@ -1,5 +1,7 @@
 #pragma once
-// The camera family. The options set holds one physical camera.
+// The camera family. Its one kind is the physical camera (kind 0), which the
+// options set holds by value; the family has no creation function, because no
+// record stores a camera behind a kind id.
 #include "archive/Serializable.hpp"
 
 #include <boost/shared_ptr.hpp>
@@ -11,8 +13,11 @@ namespace OrvexKavorCore {
 
 class BaseCamera : public OrvexSerializable, public OrvexXMLSerializable {
 public:
+    // The camera kind (0 for the physical camera).
     virtual std::int32_t kindId() const = 0;
+    // A new camera that is a copy of this one.
     virtual boost::shared_ptr<BaseCamera> clone() const = 0;
+    // Sets every field to its default.
     virtual void resetToDefaults() = 0;
 };
 

@@ -1,0 +1,137 @@
+// The XML document of an options set: the twenty-one settings sections as golden
+// documents, and what single parameters show for chosen values.
+//
+// Set DEXMOR_UPDATE_GOLDEN=1 to rewrite the golden files from the current output
+// (then review the difference before keeping it).
+#include "options/AllOptions.hpp"
+#include "textures/SkyTexture.hpp"
+#include "xml/AssetXmlWriter.hpp"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <fstream>
+#include <functional>
+#include <string>
+#include <tuple>
+
+using namespace OrvexKavorCore;
+
+namespace {
+
+std::string documentOf(AllOptions& o, const std::string& path = "") {
+    std::string xml;
+    AssetXmlWriter writer(xml);
+    writer.beginDocument();
+    o.writeXml(writer, path);
+    writer.endDocument();
+    EXPECT_EQ(writer.depth(), 0u);
+    return xml;
+}
+
+void expectGolden(const std::string& actual, const std::string& name) {
+    const std::string path = std::string(DEXMOR_SOURCE_DIR) + "/tests/golden/" + name;
+    if (std::getenv("DEXMOR_UPDATE_GOLDEN")) std::ofstream(path, std::ios::binary) << actual;
+    std::ifstream in(path, std::ios::binary);
+    ASSERT_TRUE(in) << path;
+    const std::string expected{std::istreambuf_iterator<char>(in), {}};
+    EXPECT_EQ(actual, expected) << name;
+}
+
+std::size_t occurrences(const std::string& text, const std::string& what) {
+    std::size_t n = 0;
+    for (auto at = text.find(what); at != std::string::npos; at = text.find(what, at + 1)) ++n;
+    return n;
+}
+
+// Parameter `name` of the asset at `url`, its lines without indentation, joined.
+std::string parameterOf(const std::string& xml, const std::string& url, const std::string& name) {
+    const auto asset = xml.find("url=\"" + url + "\" >");
+    if (asset == std::string::npos) return "(no asset " + url + ")";
+    const auto at = xml.find(" name=\"" + name + "\" ", asset);
+    if (at == std::string::npos || at > xml.find("</Asset>", asset)) return "(no parameter " + name + ")";
+    std::string joined;
+    for (auto line = xml.rfind('\n', at) + 1;;) {
+        const auto end = xml.find('\n', line);
+        const std::string text = xml.substr(line, end - line);
+        joined += text.substr(text.find_first_not_of(' '));
+        if (text.find("</parameter>") != std::string::npos) return joined;
+        line = end + 1;
+    }
+}
+
+} // namespace
+
+TEST(Settings, DefaultDocumentGolden) {
+    resetSharedDefaultSun();
+    AllOptions options;
+    const std::string xml = documentOf(options);
+    expectGolden(xml, "options_default.xml");
+    EXPECT_EQ(occurrences(xml, "<Assets>\n"), 22u); // the document's and one per section
+}
+
+TEST(Settings, EnvironmentTexturesGolden) {
+    resetSharedDefaultSun();
+    AllOptions options;
+    options.bg_tex = createTexture(BaseTexture::kChecker);
+    options.gi_tex = createTexture(BaseTexture::kSky);
+    options.reflect_tex = createTexture(BaseTexture::kSky);
+    options.refract_tex = createTexture(BaseTexture::kFresnel);
+    options.bg_tex_mult = 2.0f;
+    options.refract_mult = 3.0f;
+    const std::string xml = documentOf(options);
+    expectGolden(xml, "options_environment_textures.xml");
+
+    // The two skies share the default sun: its asset is written once, first.
+    EXPECT_EQ(occurrences(xml, "url=\"/SunLight\""), 1u);
+    EXPECT_EQ(occurrences(xml, "type=\"light\" url="), 1u);
+    const auto environment = xml.find("url=\"/SettingsEnvironment\"");
+    EXPECT_LT(xml.find("url=\"/SunLight\""), xml.find("url=\"/SettingsEnvironment/gi_texture\""));
+    for (const char* child : {"bg_texture", "gi_texture", "reflect_texture", "refract_texture"})
+        EXPECT_LT(xml.find(std::string("url=\"/SettingsEnvironment/") + child + "\""), environment) << child;
+}
+
+TEST(Settings, WhatParametersShow) {
+    // One parameter's lines without indentation, as `parameterOf` joins them.
+    const auto shown = [](const char* type, const char* name, const std::string& value, const char* extra = "") {
+        return std::string("<parameter type=\"") + type + "\" name=\"" + name + "\" listType=\"none\"" + extra +
+               " label=\"" + name + "\"><value>" + value + "</value></parameter>";
+    };
+    const std::string clapper = "\xF0\x9F\x8E\xAC";
+    const std::tuple<std::function<void(AllOptions&)>, const char*, const char*, std::string> cases[] = {
+        // The filter kinds 1 and 2 are exchanged.
+        {[](AllOptions& o) { o.filter_kind = 1; }, "/SettingsImageFilter", "type", shown("integer", "type", "2")},
+        {[](AllOptions& o) { o.filter_kind = 2; }, "/SettingsImageFilter", "type", shown("integer", "type", "1")},
+        // The multiplier follows whether the texture is set.
+        {[](AllOptions& o) { o.bg_mult = 3, o.bg_tex_mult = 7; }, "/SettingsEnvironment", "bg_mult",
+         shown("float", "bg_mult", "3")},
+        {[](AllOptions& o) { o.bg_mult = 3, o.bg_tex_mult = 7, o.bg_tex = createTexture(BaseTexture::kChecker); },
+         "/SettingsEnvironment", "bg_mult", shown("float", "bg_mult", "7")},
+        // The depth-of-field switch shows the stored inverse.
+        {[](AllOptions& o) { o.inverse_override_focal_dist = 0; }, "/SettingsCameraDof", "override_focal_dist",
+         shown("bool", "override_focal_dist", "1", " isUserData=\"1\"")},
+        // Unsigned fields show as signed 32-bit integers.
+        {[](AllOptions& o) { o.params.gi.primary_engine = 0xFFFFFFFFu; }, "/SettingsGI", "primary_engine",
+         shown("integer", "primary_engine", "-1")},
+        // Channels by name; an id without a name gives an empty entry.
+        {[](AllOptions& o) { o.channels = {126, 99, 133, 123, 125}; }, "/SettingsRenderChannels", "channel_names",
+         "<parameter type=\"list\" name=\"channel_names\" listType=\"string\" label=\"VFB Channels\"><value><list>"
+         "<entry>RGB color</entry><entry></entry><entry>SSS2</entry><entry>Normals</entry><entry>Alpha</entry>"
+         "</list></value></parameter>"},
+        // File names: at most 2047 UTF-16 units.
+        {[clapper](AllOptions& o) { o.img_file = std::string(2046, 'x') + clapper; }, "/SettingsOutput", "img_file",
+         shown("string", "img_file", std::string(2046, 'x'))},
+        // Animated camera values show their value at time 0.
+        {[](AllOptions& o) { o.camera.focal_length.setValue(85.0f, 10.0), o.camera.focal_length.setValue(50.0f, 0.0); },
+         "/CameraPhysical", "focal_length", shown("float", "focal_length", "50")},
+    };
+    for (const auto& [set, url, name, expected] : cases) {
+        AllOptions options;
+        set(options);
+        EXPECT_EQ(parameterOf(documentOf(options), url, name), expected);
+    }
+
+    // Section urls begin with the prefix the caller gives.
+    AllOptions options;
+    EXPECT_EQ(parameterOf(documentOf(options, "/opts"), "/opts/CameraPhysical", "on"), shown("bool", "on", "0"));
+}
