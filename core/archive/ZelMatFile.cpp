@@ -4,6 +4,7 @@
 #include "platform/FileIo.hpp"
 #include "xml/AssetXmlWriter.hpp"
 #include "platform/Text.hpp"
+#include "textures/SkyTexture.hpp"
 
 #include <algorithm>
 #include <cstring>
@@ -187,6 +188,9 @@ std::ios_base::openmode ZelMatFile::probeOpenMode(const std::filesystem::path& p
 }
 
 std::string ZelMatFile::toXml(const std::filesystem::path& path) {
+    // Every conversion starts from a pristine default sun: what one file's sky
+    // records write into it must not reach the next file.
+    resetSharedDefaultSun();
     const std::optional<std::string> bytes = readRegularFile(path);
     if (!bytes) return {};
     if (readFromBytes(*bytes)) {

@@ -1,12 +1,150 @@
 #include "materials/BaseMaterial.hpp"
 
+#include "archive/QuickArchive.hpp"
+#include "materials/CompositeMaterials.hpp"
+#include "materials/LayeredMaterials.hpp"
+#include "materials/ReferenceMaterials.hpp"
+#include "materials/SceneMaterials.hpp"
+#include "materials/WrapperMaterials.hpp"
+
+#include <boost/make_shared.hpp>
+
+#include <algorithm>
+#include <new>
+#include <utility>
+
 namespace OrvexKavorCore {
 
 MaterialPtr createMaterial(std::int32_t kind) {
     switch (kind) {
+    case BaseMaterial::kSingleBRDF:
+        return boost::make_shared<MaterialSingleBRDF>();
+    case BaseMaterial::kLayeredBRDF:
+        return boost::make_shared<MaterialLayeredBRDF>();
+    case BaseMaterial::kMulti:
+        return boost::make_shared<MaterialMulti>();
+    case BaseMaterial::kBump:
+        return boost::make_shared<MaterialBump>();
+    case BaseMaterial::kInstance:
+        return boost::make_shared<MaterialInstance>();
+    case BaseMaterial::k2Sided:
+        return boost::make_shared<Material2Sided>();
+    case BaseMaterial::kLinked:
+        return boost::make_shared<MaterialLinked>();
+    case BaseMaterial::kSkp2Sided:
+        return boost::make_shared<MaterialSkp2Sided>();
+    case BaseMaterial::kOverrideEnvironment:
+        return boost::make_shared<MaterialOverrideEnvironment>();
+    case BaseMaterial::kDisplaced:
+        return boost::make_shared<MaterialDisplaced>();
+    case BaseMaterial::kObjectExclusion:
+        return boost::make_shared<MaterialObjectExclusion>();
+    case BaseMaterial::kAlphaContribution:
+        return boost::make_shared<MaterialAlphaContribution>();
+    case BaseMaterial::kAngleBlend:
+        return boost::make_shared<MaterialAngleBlend>();
+    case BaseMaterial::kReference:
+        return boost::make_shared<MaterialReference>();
+    case BaseMaterial::kToon:
+        return boost::make_shared<MaterialToon>();
     default:
         return {};
     }
+}
+
+std::string defaultMaterialName() { return SceneMaterials::instance()->uniqueName(BaseMaterial::kDefaultName); }
+
+// --- BaseMaterial ---
+
+BaseMaterial::BaseMaterial() { resetBase(); }
+
+BaseMaterial::BaseMaterial(const BaseMaterial& other) : name(other.name) {}
+
+BaseMaterial& BaseMaterial::operator=(const BaseMaterial& other) {
+    name = other.name;
+    return *this;
+}
+
+BaseMaterial::~BaseMaterial() = default;
+
+void BaseMaterial::resetBase() {
+    name = defaultMaterialName();
+    identifier.clear();
+}
+
+bool BaseMaterial::writeBaseRecord(QuickArchive& ar) const {
+    ar.write(VersionWord::make(0, 2));
+    ar.writeWString(name);
+    ar.writeWString(identifier);
+    return true;
+}
+
+bool BaseMaterial::readBaseRecord(QuickArchive& ar) {
+    const auto version = ar.get<VersionWord>();
+    if (version.first() != 0 || version.second() < 1 || version.second() > 2)
+        return ar.fail("unknown base material record version (" + std::to_string(version.first()) + ", " +
+                       std::to_string(version.second()) + ")");
+    if (!ar.readWString(name)) return false;
+    if (version.second() == 2 && !ar.readWString(identifier)) return false;
+    if (name.empty()) name = defaultMaterialName();
+    return true;
+}
+
+bool BaseMaterial::readNameItem(QuickArchive& ar) {
+    std::string stored;
+    if (!ar.readWString(stored)) return false;
+    name = SceneMaterials::instance()->uniqueName(stored.empty() ? kDefaultName : std::string_view(stored));
+    return true;
+}
+
+// Each material leaving the loop has had its members taken by its last owner, so
+// destroying it recurses no further.
+void BaseMaterial::releaseMaterialMembers() noexcept {
+    std::vector<MaterialPtr> pending;
+    try {
+        takeMaterialMembers(pending);
+        while (!pending.empty()) {
+            MaterialPtr next = std::move(pending.back());
+            pending.pop_back();
+            if (next.use_count() == 1) next->takeMaterialMembers(pending);
+        }
+    } catch (const std::bad_alloc&) {
+        // Without memory for the list, the rest is released the ordinary way.
+    }
+}
+
+// --- MaterialWalk ---
+
+namespace {
+
+struct WalkStep {
+    MaterialWalk::Purpose purpose;
+    const void* material;
+    const void* other;
+    bool operator==(const WalkStep&) const = default;
+};
+
+thread_local std::vector<WalkStep> tWalkPath;
+
+} // namespace
+
+MaterialWalk::MaterialWalk(Purpose purpose, const void* material, const void* other) : state_(State::kEntered) {
+    const WalkStep step{purpose, material, other};
+    if (tWalkPath.size() >= QuickArchive::kMaxNesting)
+        state_ = State::kTooDeep;
+    else if (std::find(tWalkPath.begin(), tWalkPath.end(), step) != tWalkPath.end())
+        state_ = State::kCycle;
+    else
+        tWalkPath.push_back(step);
+}
+
+MaterialWalk::~MaterialWalk() {
+    if (state_ == State::kEntered) tWalkPath.pop_back();
+}
+
+bool MaterialWalk::isInside(Purpose purpose, const void* material) {
+    return std::any_of(tWalkPath.begin(), tWalkPath.end(),
+                       [&](const WalkStep& s) { return s.purpose == purpose && s.material == material; });
 }
 
 } // namespace OrvexKavorCore

@@ -1,5 +1,23 @@
 #pragma once
 // The material family: every material of a library derives from BaseMaterial.
+//
+// The base carries the material's name and identifier and the base record that
+// every material record holds somewhere in its layout:
+//   VersionWord (0, 2)
+//   WString     name
+//   WString     identifier        (version 2 on)
+// An empty stored name reads as a fresh default name.
+//
+// Default names. A new material, and every reset that takes a new name, is named
+// after "DefaultMaterial" by the scene library's unique-name rule: the name is
+// "DefaultMaterial" while the library holds no material of that name, and the
+// next free counter form ("DefaultMaterial1", ...) otherwise. The name is not
+// entered into the library, so a default name depends on the library's content
+// only, never on other materials made (or files converted) before.
+//
+// Walks over material trees (search, comparison, copy, writing, XML) are bounded
+// by MaterialWalk: materials reached through the library by identifier can form
+// cycles in memory, and trees built in memory can be deeper than any file allows.
 #include "archive/Members.hpp"
 #include "archive/Serializable.hpp"
 
@@ -7,6 +25,8 @@
 
 #include <cstdint>
 #include <string>
+#include <string_view>
+#include <vector>
 
 namespace OrvexKavorCore {
 
@@ -30,11 +50,28 @@ public:
         kReference = 13,
         kToon = 14,
     };
+    static constexpr std::int32_t kKindCount = 15;
+
+    // The name that default names are derived from.
+    static constexpr std::string_view kDefaultName = "DefaultMaterial";
 
     // The material's name: also the last part of its asset url.
     std::string name;
     // The identifier (UUID text) under which the scene library maps the material.
     std::string identifier;
+
+    // A material with a fresh default name and no identifier.
+    BaseMaterial();
+    // Copies take the name only: a copy starts without an identifier, so that the
+    // library gives it one of its own when it is added.
+    BaseMaterial(const BaseMaterial& other);
+    BaseMaterial& operator=(const BaseMaterial& other);
+    ~BaseMaterial() override;
+
+    // The base record alone. Each kind writes and reads it at the place its own
+    // layout names it.
+    bool writeToArchive(QuickArchive& ar) override { return writeBaseRecord(ar); }
+    bool readFromArchive(QuickArchive& ar) override { return readBaseRecord(ar); }
 
     virtual std::int32_t kindId() const = 0;
     virtual void resetToDefaults() = 0;
@@ -45,12 +82,40 @@ public:
     // Same kind and same content; names and identifiers are not compared.
     virtual bool isEqual(const boost::shared_ptr<BaseMaterial>& other) const = 0;
 
+    // The material's own (unfolded) asset: nothing for the base.
     void writeXml(AssetXmlWriter&, std::string) override {}
     std::string pluginType() const override { return {}; }
     std::string assetType() const override { return "material"; }
+
+    // The base record: VersionWord (0, 2), name, identifier. Always succeeds.
+    bool writeBaseRecord(QuickArchive& ar) const;
+    // Versions 1 (name) and 2 (name, identifier); an empty name becomes a fresh
+    // default name. Does not reset the material.
+    bool readBaseRecord(QuickArchive& ar);
+    // The name item of older records: a WString name; an empty one counts as
+    // "DefaultMaterial", and the result always goes through the library's
+    // unique-name rule.
+    bool readNameItem(QuickArchive& ar);
+
+protected:
+    // Constructs without naming: for the fresh field values of a reset.
+    struct Unnamed {};
+    explicit BaseMaterial(Unnamed) {}
+
+    // The base reset: a fresh default name, no identifier.
+    void resetBase();
+
+    // Moves the sub-materials this material owns into `out`. Kinds that hold
+    // materials override it and call releaseMaterialMembers() from their
+    // destructor, so that destroying a tree of any depth takes constant stack.
+    virtual void takeMaterialMembers(std::vector<boost::shared_ptr<BaseMaterial>>& out) { (void)out; }
+    void releaseMaterialMembers() noexcept;
 };
 
 using MaterialPtr = boost::shared_ptr<BaseMaterial>;
+
+// A fresh default name: the library's unique name for "DefaultMaterial".
+std::string defaultMaterialName();
 
 // A new material of the kind with its defaults, or an empty pointer for an id
 // outside the table.
@@ -60,6 +125,34 @@ template <>
 struct Family<BaseMaterial> {
     static constexpr const char* word = "material";
     static MaterialPtr create(std::int32_t kind) { return createMaterial(kind); }
+};
+
+// One level of a recursive walk over materials, kept per thread. A walk refuses
+// to go on (the guard is false) when the path is longer than the archive's
+// nesting limit, or when it comes back to a step it is already inside: the same
+// material for the same purpose (for a comparison, the same pair). The caller
+// then stops there: a search contributes nothing, a write fails, a copy is empty,
+// an XML asset is not written; a comparison that comes back to the pair it is
+// already comparing counts as equal, one too deep as unequal.
+class MaterialWalk {
+public:
+    enum Purpose : unsigned char { kSearch, kCompare, kCopy, kWrite, kXml };
+
+    MaterialWalk(Purpose purpose, const void* material, const void* other = nullptr);
+    ~MaterialWalk();
+    MaterialWalk(const MaterialWalk&) = delete;
+    MaterialWalk& operator=(const MaterialWalk&) = delete;
+
+    explicit operator bool() const { return state_ == State::kEntered; }
+    // The walk came back to a step it is already inside.
+    bool cycle() const { return state_ == State::kCycle; }
+
+    // Whether `material` is on this thread's current path for `purpose`.
+    static bool isInside(Purpose purpose, const void* material);
+
+private:
+    enum class State : unsigned char { kEntered, kCycle, kTooDeep };
+    State state_;
 };
 
 } // namespace OrvexKavorCore

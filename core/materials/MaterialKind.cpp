@@ -1,0 +1,64 @@
+#include "materials/MaterialKind.hpp"
+
+#include "materials/SceneMaterials.hpp"
+#include "xml/AssetXmlWriter.hpp"
+
+namespace OrvexKavorCore::material {
+
+bool TextList::read(QuickArchive& ar, std::vector<std::string>& list) {
+    const auto count = ar.get<std::uint32_t>();
+    if (!ar.canHold(count, 4)) return ar.fail("a list of " + std::to_string(count) + " texts cannot fit in the data");
+    list.clear();
+    list.reserve(count);
+    for (std::uint32_t i = 0; i < count; ++i) {
+        std::string text;
+        if (!ar.readWString(text)) return false;
+        list.push_back(std::move(text));
+    }
+    return true;
+}
+
+bool TextList::write(QuickArchive& ar, const std::vector<std::string>& list) {
+    ar.write(static_cast<std::uint32_t>(list.size()));
+    for (const std::string& text : list) ar.writeWString(text);
+    return true;
+}
+
+bool refuseVersion(QuickArchive& ar, const char* what, VersionWord version) {
+    return ar.fail("unknown " + std::string(what) + " version (" + std::to_string(version.first()) + ", " +
+                   std::to_string(version.second()) + ")");
+}
+
+bool copyMember(MaterialPtr& m, bool renamed) {
+    if (!m) return true;
+    m = renamed ? m->cloneRenamed() : m->clone();
+    return static_cast<bool>(m);
+}
+
+bool copyMember(TexturePtr& t) {
+    if (!t) return true;
+    t = t->clone();
+    return static_cast<bool>(t);
+}
+
+bool copyMember(BRDFPtr& b) {
+    if (!b) return true;
+    b = b->clone();
+    return static_cast<bool>(b);
+}
+
+std::string uniqueName(const std::string& source) { return SceneMaterials::instance()->uniqueName(source); }
+
+void beginAsset(AssetXmlWriter& writer, std::string_view url, std::string_view layout, std::string_view pluginType) {
+    writer.beginAsset(url, "material", layout);
+    writer.beginPlugin(pluginType, "material");
+    writer.beginParameters();
+}
+
+void endAsset(AssetXmlWriter& writer) {
+    writer.endParameters();
+    writer.endPlugin();
+    writer.endAsset();
+}
+
+} // namespace OrvexKavorCore::material
