@@ -203,4 +203,6 @@ std::string ZelMatFile::toXml(const std::filesystem::path& path) {
     return text::decodeStoredText(text::upToFirstNul(*bytes));
 }
 
+std::string ZelMatFile::toXml(const MaterialPtr& material) { return materialToXml(material); }
+
 } // namespace OrvexKavorCore

@@ -64,6 +64,8 @@ public:
 
     // The XML text of the file at `path`, or its pass-through text (see Conversion.hpp).
     std::string toXml(const std::filesystem::path& path);
+    // The "<Assets>" block of one material.
+    static std::string toXml(const MaterialPtr& material);
 
     // Splits header and archive; nullopt (with `failure` set) when the header is unusable.
     static std::optional<Framing> readFraming(std::string_view bytes, ReadFailure* failure = nullptr);

@@ -234,3 +234,8 @@ TEST(OptionsFile, TheFileIsTheArchiveChunks) {
     EXPECT_FALSE(file.readFile(small, dir.file("empty.zelopt", "")));
     EXPECT_FALSE(file.readFile(small, dir.path() / "missing.zelopt"));
 }
+
+TEST(MaterialFile, OneMaterialsBlock) {
+    // A material that claims the layered kind without being one gives an empty block.
+    EXPECT_EQ(ZelMatFile::toXml(MaterialPtr(new UnwritableMaterial)), "<Assets>\n</Assets>\n");
+}
