@@ -27,11 +27,16 @@ bool ZelOptFile::readFile(OrvexSerializable& object, const std::filesystem::path
         lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
         return false;
     }
-    if (bytes->empty()) {
+    return readBytes(object, *bytes);
+}
+
+bool ZelOptFile::readBytes(OrvexSerializable& object, std::string_view bytes) {
+    lastReadFailure_.reset();
+    if (bytes.empty()) {
         lastReadFailure_ = ReadFailure{"the file is empty", 0, {}};
         return false;
     }
-    QuickArchive ar(bytes->data(), bytes->size());
+    QuickArchive ar(bytes.data(), bytes.size());
     if (!ar.failed() && object.readFromArchive(ar)) return true;
     if (!ar.failed()) ar.fail("the record was rejected");
     lastReadFailure_ = ar.failure();
@@ -41,8 +46,10 @@ bool ZelOptFile::readFile(OrvexSerializable& object, const std::filesystem::path
 std::string ZelOptFile::toXml(const std::filesystem::path& path) {
     // Every conversion starts from a pristine default sun (sky textures share it).
     resetSharedDefaultSun();
+    const std::optional<std::string> bytes = readRegularFile(path);
+    if (!bytes) return {};
     AllOptions options;
-    if (readFile(options, path)) {
+    if (readBytes(options, *bytes)) {
         std::string xml;
         AssetXmlWriter writer(xml);
         writer.beginDocument();
@@ -51,8 +58,6 @@ std::string ZelOptFile::toXml(const std::filesystem::path& path) {
         return xml;
     }
     // Not a binary options file: the file is taken to be XML text already.
-    const std::optional<std::string> bytes = readRegularFile(path);
-    if (!bytes) return {};
     return text::decodeStoredText(text::upToFirstNul(*bytes));
 }
 

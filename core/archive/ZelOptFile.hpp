@@ -10,6 +10,7 @@
 #include <filesystem>
 #include <optional>
 #include <string>
+#include <string_view>
 
 namespace OrvexKavorCore {
 
@@ -23,8 +24,10 @@ public:
     // Loads the object from the file; false for a missing, empty or unreadable file
     // or a record the object rejects.
     virtual bool readFile(OrvexSerializable& object, const std::filesystem::path& path);
+    // The same on the bytes of a file in memory.
+    bool readBytes(OrvexSerializable& object, std::string_view bytes);
 
-    // The XML text of the file at `path`, or its pass-through text (see Conversion.hpp).
+    // The XML text of the file at `path` (read once), or its pass-through text (see Conversion.hpp).
     std::string toXml(const std::filesystem::path& path);
 
     const std::optional<ReadFailure>& lastReadFailure() const { return lastReadFailure_; }
