@@ -2,11 +2,12 @@
 //
 //   Dexmor.getZelmatXml(path) -> str   XML of a material library (".zelmat")
 //   Dexmor.getZeloptXml(path) -> str   XML of a render-options file (".zelopt")
+//   Dexmor.diagnose(path) -> str|None  why a file does not read as binary, or None
 //   Dexmor.error                      raised when a path has the wrong extension
 //                                     or the conversion fails unexpectedly
 //
-// The module only handles arguments and results; the conversion itself is
-// OrvexKavorCore::convertToXml, which runs with the interpreter lock released.
+// The module only handles arguments and results; the conversion and the
+// diagnosis are the core's, and run with the interpreter lock released.
 #define PY_SSIZE_T_CLEAN
 #include <Python.h>
 
@@ -17,6 +18,7 @@
 #include <exception>
 #include <filesystem>
 #include <new>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -43,13 +45,14 @@ private:
 };
 
 struct Call {
-    core::FileKind kind;
+    std::optional<core::FileKind> kind; // none: either kind, by the path's extension
     const char* name;
     const char* format; // "O:" + name, so argument errors name the function
 };
 
 constexpr Call zelmatCall{core::FileKind::MaterialLibrary, "getZelmatXml", "O:getZelmatXml"};
 constexpr Call zeloptCall{core::FileKind::RenderOptions, "getZeloptXml", "O:getZeloptXml"};
+constexpr Call diagnoseCall{std::nullopt, "diagnose", "O:diagnose"};
 
 // Raises Dexmor.error with a message that may not be valid UTF-8.
 void raiseModuleError(const char* message) noexcept {
@@ -95,70 +98,105 @@ PyObject* pathAsText(PyObject* argument, const Call& call) {
     return nullptr;
 }
 
-// The body of both calls. C++ exceptions leave it only while the interpreter
-// lock is held.
-PyObject* convertFile(PyObject* args, const Call& call) {
+// A file argument: its path as the system sees it, and the kind it names.
+struct FileArgument {
+    std::string path;
+    core::FileKind kind;
+};
+
+// Parses the one path argument of a call and checks its extension; nullopt with
+// an exception set when it is not acceptable.
+std::optional<FileArgument> fileArgument(PyObject* args, const Call& call) {
     PyObject* argument = nullptr;
-    if (!PyArg_ParseTuple(args, call.format, &argument)) return nullptr;
+    if (!PyArg_ParseTuple(args, call.format, &argument)) return std::nullopt;
     const Ref text(pathAsText(argument, call));
-    if (!text) return nullptr;
+    if (!text) return std::nullopt;
 
     // As open() does: a NUL would silently shorten the path the system sees.
     const Py_ssize_t nul = PyUnicode_FindChar(text.get(), 0, 0, PyUnicode_GET_LENGTH(text.get()), 1);
-    if (nul == -2) return nullptr;
+    if (nul == -2) return std::nullopt;
     if (nul >= 0) {
         PyErr_SetString(PyExc_ValueError, "embedded null character");
-        return nullptr;
+        return std::nullopt;
     }
 
     // The file-system encoding with surrogate escapes, as open() encodes a str
     // path, so a name that is not valid UTF-8 still reaches its file.
     const Ref encoded(PyUnicode_EncodeFSDefault(text.get()));
-    if (!encoded) return nullptr;
+    if (!encoded) return std::nullopt;
     std::string path(PyBytes_AS_STRING(encoded.get()), static_cast<std::size_t>(PyBytes_GET_SIZE(encoded.get())));
 
-    const std::string extension(core::extensionOf(call.kind));
-    if (!core::hasExtension(path, extension)) {
+    if (call.kind) {
+        const std::string extension(core::extensionOf(*call.kind));
+        if (core::hasExtension(path, extension)) return FileArgument{std::move(path), *call.kind};
         PyErr_Format(moduleError, "%s() expects a path ending in \".%s\" (in any letter case), got %R", call.name,
                      extension.c_str(), text.get());
-        return nullptr;
+        return std::nullopt;
     }
+    if (const std::optional<core::FileKind> kind = core::fileKindOf(path)) return FileArgument{std::move(path), *kind};
+    PyErr_Format(moduleError, "%s() expects a path ending in \".zelmat\" or \".zelopt\" (in any letter case), got %R",
+                 call.name, text.get());
+    return std::nullopt;
+}
 
-    std::string xml;
+// Runs `work` with the interpreter lock released; its exception, if any, is
+// thrown again once the lock is held.
+template <class Work>
+void withoutInterpreterLock(Work&& work) {
     std::exception_ptr failure;
     Py_BEGIN_ALLOW_THREADS
     try {
-        xml = core::convertToXml(call.kind, std::filesystem::path(std::move(path)));
+        work();
     } catch (...) {
         failure = std::current_exception();
     }
     Py_END_ALLOW_THREADS
     if (failure) std::rethrow_exception(failure);
-
-    const std::string_view result = core::text::upToFirstNul(xml);
-    return PyUnicode_DecodeUTF8(result.data(), static_cast<Py_ssize_t>(result.size()), "strict");
 }
 
-PyObject* guardedConvertFile(PyObject* args, const Call& call) noexcept {
+PyObject* textObject(std::string_view text) {
+    return PyUnicode_DecodeUTF8(text.data(), static_cast<Py_ssize_t>(text.size()), "strict");
+}
+
+// The body of the conversion calls. C++ exceptions leave it only while the
+// interpreter lock is held.
+PyObject* convertFile(PyObject* args, const Call& call) {
+    std::optional<FileArgument> file = fileArgument(args, call);
+    if (!file) return nullptr;
+    std::string xml;
+    withoutInterpreterLock([&] { xml = core::convertToXml(file->kind, std::filesystem::path(std::move(file->path))); });
+    return textObject(core::text::upToFirstNul(xml));
+}
+
+PyObject* diagnoseFile(PyObject* args, const Call& call) {
+    std::optional<FileArgument> file = fileArgument(args, call);
+    if (!file) return nullptr;
+    core::Diagnosis diagnosis;
+    withoutInterpreterLock([&] { diagnosis = core::diagnose(file->kind, std::filesystem::path(std::move(file->path))); });
+    if (diagnosis.readsAsBinary) Py_RETURN_NONE;
+    return textObject(diagnosis.failure ? diagnosis.failure->describe() : std::string("no reason was recorded"));
+}
+
+template <PyObject* (*Body)(PyObject*, const Call&)>
+PyObject* guarded(PyObject* args, const Call& call) noexcept {
     try {
-        return convertFile(args, call);
+        return Body(args, call);
     } catch (...) {
         raiseFromCxx(std::current_exception());
         return nullptr;
     }
 }
 
-PyObject* getZelmatXml(PyObject*, PyObject* args) noexcept {
-    return guardedConvertFile(args, zelmatCall);
-}
-
-PyObject* getZeloptXml(PyObject*, PyObject* args) noexcept {
-    return guardedConvertFile(args, zeloptCall);
-}
+PyObject* getZelmatXml(PyObject*, PyObject* args) noexcept { return guarded<convertFile>(args, zelmatCall); }
+PyObject* getZeloptXml(PyObject*, PyObject* args) noexcept { return guarded<convertFile>(args, zeloptCall); }
+PyObject* diagnose(PyObject*, PyObject* args) noexcept { return guarded<diagnoseFile>(args, diagnoseCall); }
 
 PyMethodDef methods[] = {
     {"getZelmatXml", getZelmatXml, METH_VARARGS, "Gets the xml from a zelmat file."},
     {"getZeloptXml", getZeloptXml, METH_VARARGS, "Gets the xml from a zelopt file."},
+    {"diagnose", diagnose, METH_VARARGS,
+     "diagnose(path) -> str | None\n\nNone when the file reads as a binary file of the kind its extension names\n"
+     "(.zelmat or .zelopt); otherwise why not: the record, the byte offset and what\nwas wrong there."},
     {nullptr, nullptr, 0, nullptr},
 };
 

@@ -2,7 +2,15 @@
 
 #include "archive/ZelMatFile.hpp"
 #include "archive/ZelOptFile.hpp"
+#include "options/AllOptions.hpp"
+#include "platform/FileIo.hpp"
 #include "platform/Text.hpp"
+#include "textures/SkyTexture.hpp"
+
+#include <boost/make_shared.hpp>
+
+#include <algorithm>
+#include <cstring>
 
 namespace OrvexKavorCore {
 
@@ -22,9 +30,66 @@ std::optional<FileKind> fileKindOf(std::string_view path) {
     return std::nullopt;
 }
 
+void convertToXml(FileKind kind, const std::filesystem::path& path, const TextSink& sink) {
+    if (kind == FileKind::MaterialLibrary)
+        ZelMatFile().toXml(path, sink);
+    else
+        ZelOptFile().toXml(path, sink);
+}
+
 std::string convertToXml(FileKind kind, const std::filesystem::path& path) {
-    if (kind == FileKind::MaterialLibrary) return ZelMatFile().toXml(path);
-    return ZelOptFile().toXml(path);
+    std::string xml;
+    convertToXml(kind, path, [&xml](std::string_view piece) { xml.append(piece); });
+    return xml;
+}
+
+std::string convertBytesToXml(FileKind kind, std::string_view bytes) {
+    std::string xml;
+    const TextSink sink = [&xml](std::string_view piece) { xml.append(piece); };
+    if (kind == FileKind::MaterialLibrary)
+        ZelMatFile().bytesToXml(boost::make_shared<const std::string>(bytes), sink);
+    else
+        ZelOptFile().bytesToXml(bytes, sink);
+    return xml;
+}
+
+Diagnosis diagnose(FileKind kind, const std::filesystem::path& path) {
+    const std::optional<std::string> bytes = readRegularFile(path);
+    if (!bytes) return Diagnosis{false, false, {}, ReadFailure{"the file cannot be opened", 0, {}}, 0};
+    return diagnoseBytes(kind, *bytes);
+}
+
+Diagnosis diagnoseBytes(FileKind kind, std::string_view bytes) {
+    // Reading may change the shared default sun; start and leave it pristine.
+    resetSharedDefaultSun();
+    Diagnosis result;
+    result.opened = true;
+    if (kind == FileKind::MaterialLibrary) {
+        ZelMatFile file;
+        if (const auto framing = file.readThrough(boost::make_shared<const std::string>(bytes))) {
+            result.readsAsBinary = true;
+            result.description = "material library, generation " + std::to_string(framing->generation) + ", " +
+                                 std::to_string(framing->count) +
+                                 (framing->count == 1 ? " material" : " materials");
+        } else {
+            result.failure = file.lastReadFailure();
+        }
+    } else {
+        ZelOptFile file;
+        AllOptions options;
+        if (file.readBytes(options, bytes)) {
+            // The archive pads a short file with zero bytes, and so does this.
+            VersionWord version{};
+            std::memcpy(&version.raw, bytes.data(), std::min(bytes.size(), sizeof version.raw));
+            result.readsAsBinary = true;
+            result.description = "render options, version " + std::to_string(version.second());
+        } else {
+            result.failure = file.lastReadFailure();
+        }
+    }
+    resetSharedDefaultSun();
+    if (!result.readsAsBinary) result.fallbackLength = text::decodeStoredText(text::upToFirstNul(bytes)).size();
+    return result;
 }
 
 } // namespace OrvexKavorCore

@@ -1,6 +1,10 @@
 #pragma once
 // The conversion that the Python module and the command-line tool both call: a
 // stored file in, the text of its XML document out.
+#include "archive/QuickArchive.hpp"
+#include "xml/TextSink.hpp"
+
+#include <cstddef>
 #include <filesystem>
 #include <optional>
 #include <string>
@@ -28,5 +32,27 @@ std::optional<FileKind> fileKindOf(std::string_view path);
 // file's own bytes up to the first NUL taken as text (strict UTF-8, else
 // Windows-1252); the empty text for a file that cannot be opened. Never fails.
 std::string convertToXml(FileKind kind, const std::filesystem::path& path);
+// The same, streamed: a material library is sent one material's block at a time
+// and never held whole (the file's bytes are, once).
+void convertToXml(FileKind kind, const std::filesystem::path& path, const TextSink& sink);
+// The same for the bytes of a file in memory.
+std::string convertBytesToXml(FileKind kind, std::string_view bytes);
+
+// What the conversion of a file will find, for telling a user why a file did not
+// read as binary.
+struct Diagnosis {
+    bool opened = false;        // false: the file cannot be opened; the conversion gives the empty text
+    bool readsAsBinary = false; // the conversion gives the XML document
+    // When it reads as binary: "material library, generation 3, 12 materials" or
+    // "render options, version 23".
+    std::string description;
+    // Otherwise: the first failure the readers recorded, and the length in bytes
+    // (UTF-8) of the pass-through text the conversion returns instead.
+    std::optional<ReadFailure> failure;
+    std::size_t fallbackLength = 0;
+};
+
+Diagnosis diagnose(FileKind kind, const std::filesystem::path& path);
+Diagnosis diagnoseBytes(FileKind kind, std::string_view bytes);
 
 } // namespace OrvexKavorCore

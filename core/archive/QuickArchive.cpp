@@ -51,6 +51,33 @@ QuickArchive::QuickArchive(const void* data, std::size_t length) {
     writePos_ = length;
 }
 
+QuickArchive QuickArchive::viewOf(boost::shared_ptr<const std::string> owner, std::size_t offset,
+                                  std::size_t length) {
+    QuickArchive ar(0);
+    if (!owner || offset > owner->size() || length > owner->size() - offset) {
+        ar.fail("the archive lies outside the data");
+        return ar;
+    }
+    if (length >= kMaxSize) {
+        ar.fail("the data is 4 GiB or larger");
+        return ar;
+    }
+    const std::size_t whole = length / kChunkSize;
+    ar.chunks_.reserve(whole + 1);
+    // The bytes stay where they are. A Chunk is an array of bytes with alignment 1,
+    // so any position in the buffer can be seen as one.
+    auto* base = reinterpret_cast<std::uint8_t*>(const_cast<char*>(owner->data() + offset));
+    for (std::size_t k = 0; k < whole; ++k)
+        ar.chunks_.emplace_back(owner, reinterpret_cast<Chunk*>(base + k * kChunkSize));
+    if (const std::size_t tail = length % kChunkSize) {
+        auto chunk = newChunk();
+        std::memcpy(chunk->data(), base + whole * kChunkSize, tail);
+        ar.chunks_.push_back(std::move(chunk));
+    }
+    ar.writePos_ = length;
+    return ar;
+}
+
 QuickArchive::~QuickArchive() = default;
 
 void QuickArchive::reset() {

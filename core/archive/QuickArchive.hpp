@@ -67,6 +67,11 @@ public:
     // An archive holding exactly these bytes, read position 0, write position at
     // the end. Buffers of 4 GiB or more give an empty archive marked as failed.
     QuickArchive(const void* data, std::size_t length);
+    // An archive over `length` bytes of `owner` from `offset`, without copying them:
+    // every whole chunk is a view into the buffer, which the archive keeps alive; a
+    // trailing partial chunk is copied and zero-padded. For reading only: a write
+    // would change the owner's bytes. Out-of-range spans give a failed, empty archive.
+    static QuickArchive viewOf(boost::shared_ptr<const std::string> owner, std::size_t offset, std::size_t length);
     virtual ~QuickArchive();
 
     QuickArchive(const QuickArchive&) = default; // shares the chunks

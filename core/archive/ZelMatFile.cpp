@@ -1,10 +1,13 @@
 #include "archive/ZelMatFile.hpp"
 
+#include "lights/SunLight.hpp"
 #include "materials/MaterialAssets.hpp"
 #include "platform/FileIo.hpp"
-#include "xml/AssetXmlWriter.hpp"
 #include "platform/Text.hpp"
 #include "textures/SkyTexture.hpp"
+#include "xml/AssetXmlWriter.hpp"
+
+#include <boost/make_shared.hpp>
 
 #include <algorithm>
 #include <cstring>
@@ -30,8 +33,14 @@ std::uint32_t readLittleEndian32(const char* p) {
 } // namespace
 
 std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(std::string_view bytes, ReadFailure* failure) {
-    const auto reject = [&](std::string reason, std::uint64_t offset) -> std::optional<Framing> {
-        if (failure) *failure = ReadFailure{std::move(reason), offset, "header"};
+    return readFraming(boost::make_shared<const std::string>(bytes), failure);
+}
+
+std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(const SharedBytes& shared, ReadFailure* failure) {
+    const std::string_view bytes = *shared;
+    const auto reject = [&](std::string reason, std::uint64_t offset,
+                            std::string recordPath = "header") -> std::optional<Framing> {
+        if (failure) *failure = ReadFailure{std::move(reason), offset, std::move(recordPath)};
         return std::nullopt;
     };
     if (bytes.size() < kHeaderSize) return reject("the file is shorter than its 8-byte header", 0);
@@ -48,24 +57,26 @@ std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(std::string_view byte
     switch (framing.generation) {
     case 1: {
         // The first generation's writer lost every carriage-return byte; so does its reader.
-        std::string kept;
-        kept.reserve(body.size());
-        std::copy_if(body.begin(), body.end(), std::back_inserter(kept), [](char c) { return c != '\x0D'; });
-        framing.archive = QuickArchive(kept.data(), kept.size());
+        auto kept = boost::make_shared<std::string>();
+        kept->reserve(body.size());
+        std::copy_if(body.begin(), body.end(), std::back_inserter(*kept), [](char c) { return c != '\x0D'; });
+        framing.archive = QuickArchive::viewOf(kept, 0, kept->size());
         break;
     }
     case 2:
-        framing.archive = QuickArchive(body.data(), body.size());
+        framing.archive = QuickArchive::viewOf(shared, kHeaderSize, body.size());
         break;
     default: {
-        std::istringstream in{std::string(body)};
-        if (!framing.archive.load(in)) {
-            ReadFailure why = *framing.archive.failure();
-            why.offset += kHeaderSize;
-            why.recordPath = "archive image";
-            if (failure) *failure = std::move(why);
-            return std::nullopt;
-        }
+        // UInt32 chunk count, then the chunks; bytes after the last chunk are ignored.
+        constexpr std::size_t kChunksAt = kHeaderSize + 4;
+        if (body.size() < 4) return reject("the chunk count is missing", kHeaderSize, "archive image");
+        const std::uint64_t chunks = readLittleEndian32(body.data());
+        const std::uint64_t present = (bytes.size() - kChunksAt) / QuickArchive::kChunkSize;
+        if (chunks > present)
+            return reject("the archive ends inside chunk " + std::to_string(present) + " of " +
+                              std::to_string(chunks),
+                          kChunksAt + present * QuickArchive::kChunkSize, "archive image");
+        framing.archive = QuickArchive::viewOf(shared, kChunksAt, chunks * QuickArchive::kChunkSize);
         break;
     }
     }
@@ -76,23 +87,15 @@ std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(std::string_view byte
     return framing;
 }
 
-bool ZelMatFile::readFromBytes(std::string_view bytes) {
-    lastReadFailure_.reset();
-    ReadFailure headerFailure;
-    std::optional<Framing> framing = readFraming(bytes, &headerFailure);
-    if (!framing) {
-        lastReadFailure_ = std::move(headerFailure);
-        return false;
-    }
-    QuickArchive& ar = framing->archive;
+bool ZelMatFile::readMaterials(Framing& framing, const std::function<void(MaterialPtr&&)>& take) {
+    QuickArchive& ar = framing.archive;
     // A material record takes at least a kind id and a version word.
-    if (!ar.canHold(framing->count, 8)) {
-        ar.fail("a count of " + std::to_string(framing->count) + " materials cannot fit in the file");
+    if (!ar.canHold(framing.count, 8)) {
+        ar.fail("a count of " + std::to_string(framing.count) + " materials cannot fit in the file");
         lastReadFailure_ = ar.failure();
         return false;
     }
-    std::vector<MaterialPtr> read;
-    for (std::uint32_t i = 0; i < framing->count; ++i) {
+    for (std::uint32_t i = 0; i < framing.count; ++i) {
         MaterialPtr material;
         if (!readMember(ar, material, nullptr, i)) {
             if (!ar.failed()) {
@@ -102,8 +105,26 @@ bool ZelMatFile::readFromBytes(std::string_view bytes) {
             lastReadFailure_ = ar.failure();
             return false;
         }
-        read.push_back(std::move(material));
+        take(std::move(material));
     }
+    return true;
+}
+
+bool ZelMatFile::readFromBytes(std::string_view bytes) {
+    return readFromBytes(boost::make_shared<const std::string>(bytes));
+}
+
+bool ZelMatFile::readFromBytes(const SharedBytes& bytes) {
+    lastReadFailure_.reset();
+    ReadFailure headerFailure;
+    std::optional<Framing> framing = readFraming(bytes, &headerFailure);
+    if (!framing) {
+        lastReadFailure_ = std::move(headerFailure);
+        return false;
+    }
+    std::vector<MaterialPtr> read;
+    if (!readMaterials(*framing, [&](MaterialPtr&& material) { read.push_back(std::move(material)); }))
+        return false;
     materials = std::move(read);
     return true;
 }
@@ -187,20 +208,64 @@ std::ios_base::openmode ZelMatFile::probeOpenMode(const std::filesystem::path& p
     return std::ios_base::in | std::ios_base::binary;
 }
 
+std::optional<ZelMatFile::Framing> ZelMatFile::readThrough(const SharedBytes& bytes) {
+    lastReadFailure_.reset();
+    ReadFailure headerFailure;
+    std::optional<Framing> framing = readFraming(bytes, &headerFailure);
+    if (!framing) {
+        lastReadFailure_ = std::move(headerFailure);
+        return std::nullopt;
+    }
+    if (!readMaterials(*framing, [](MaterialPtr&&) {})) return std::nullopt;
+    return framing;
+}
+
+bool ZelMatFile::writeXml(const SharedBytes& bytes, const TextSink& sink) {
+    // Sky records read into the shared default sun, and every sky that uses it
+    // writes it as the last record left it. The first pass ends in that state;
+    // the second pass reads the records again, so the state is put back before
+    // each material is written.
+    const boost::shared_ptr<SunLight> defaultSun = sharedDefaultSun();
+    const SunLight pristineSun = *defaultSun;
+    std::optional<Framing> framing = readThrough(bytes);
+    if (!framing) return false;
+    const SunLight finalSun = *defaultSun;
+
+    *defaultSun = pristineSun;
+    framing = readFraming(bytes);
+    std::string block;
+    AssetXmlWriter writer(block);
+    return readMaterials(*framing, [&](MaterialPtr&& material) {
+        *defaultSun = finalSun;
+        block.clear();
+        writeMaterialAssets(writer, material);
+        material.reset(); // a deep tree goes before its text is sent on
+        sink(block);
+    });
+}
+
 std::string ZelMatFile::toXml(const std::filesystem::path& path) {
+    std::string xml;
+    toXml(path, [&xml](std::string_view piece) { xml.append(piece); });
+    return xml;
+}
+
+void ZelMatFile::toXml(const std::filesystem::path& path, const TextSink& sink) {
+    std::optional<std::string> bytes = readRegularFile(path);
+    if (!bytes) {
+        lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
+        return;
+    }
+    bytesToXml(boost::make_shared<const std::string>(std::move(*bytes)), sink);
+}
+
+void ZelMatFile::bytesToXml(const SharedBytes& bytes, const TextSink& sink) {
     // Every conversion starts from a pristine default sun: what one file's sky
     // records write into it must not reach the next file.
     resetSharedDefaultSun();
-    const std::optional<std::string> bytes = readRegularFile(path);
-    if (!bytes) return {};
-    if (readFromBytes(*bytes)) {
-        std::string xml;
-        AssetXmlWriter writer(xml);
-        for (const MaterialPtr& material : materials) writeMaterialAssets(writer, material);
-        return xml;
-    }
+    if (writeXml(bytes, sink)) return;
     // Not a binary library: the file is taken to be XML text already.
-    return text::decodeStoredText(text::upToFirstNul(*bytes));
+    sink(text::decodeStoredText(text::upToFirstNul(*bytes)));
 }
 
 std::string ZelMatFile::toXml(const MaterialPtr& material) { return materialToXml(material); }

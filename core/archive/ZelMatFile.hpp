@@ -12,6 +12,9 @@
 // every 0x0D byte removed before reading), 3 the chunked image above.
 #include "archive/QuickArchive.hpp"
 #include "materials/BaseMaterial.hpp"
+#include "xml/TextSink.hpp"
+
+#include <boost/shared_ptr.hpp>
 
 #include <cstdint>
 #include <filesystem>
@@ -33,6 +36,9 @@ public:
         QuickArchive archive;
     };
 
+    // The bytes of a whole file, shared with the archives that read them in place.
+    using SharedBytes = boost::shared_ptr<const std::string>;
+
     ZelMatFile() = default;
     virtual ~ZelMatFile() = default;
 
@@ -43,8 +49,9 @@ public:
     virtual bool writeToStream(std::ostream& out);
     // Reads a whole file; on failure the list keeps its earlier content.
     virtual bool readFromStream(std::istream& in);
-    // The same on bytes in memory.
+    // The same on bytes in memory (the first copies them, the second reads them in place).
     bool readFromBytes(std::string_view bytes);
+    bool readFromBytes(const SharedBytes& bytes);
 
     bool add(const MaterialPtr& material);
     std::size_t count() const { return materials.size(); }
@@ -64,17 +71,40 @@ public:
 
     // The XML text of the file at `path`, or its pass-through text (see Conversion.hpp).
     std::string toXml(const std::filesystem::path& path);
+    // The same, streamed to `sink`.
+    void toXml(const std::filesystem::path& path, const TextSink& sink);
+    // The same for the bytes of a file.
+    void bytesToXml(const SharedBytes& bytes, const TextSink& sink);
+
+    // Streams the XML document of the library in `bytes` to `sink`, one material's
+    // "<Assets>" block at a time, holding one material in memory. The library is
+    // first read through once, each material dropped as soon as it has read, so
+    // that a library failing anywhere sends nothing; then each material is read
+    // again, written and dropped. False, with lastReadFailure() set and nothing
+    // sent, when the bytes do not read as a library. `materials` is left alone.
+    bool writeXml(const SharedBytes& bytes, const TextSink& sink);
+
+    // Whether the bytes read as a library, each material dropped as soon as it has
+    // read; on success the header is returned (its archive read through), otherwise
+    // lastReadFailure() says why. `materials` is left alone.
+    std::optional<Framing> readThrough(const SharedBytes& bytes);
     // The "<Assets>" block of one material.
     static std::string toXml(const MaterialPtr& material);
 
     // Splits header and archive; nullopt (with `failure` set) when the header is unusable.
     static std::optional<Framing> readFraming(std::string_view bytes, ReadFailure* failure = nullptr);
+    // The same without copying: the archive reads `bytes` in place (generation 1 excepted).
+    static std::optional<Framing> readFraming(const SharedBytes& bytes, ReadFailure* failure = nullptr);
 
     // The message of the last failed write, and why the last read failed.
     const std::string& lastError() const { return lastError_; }
     const std::optional<ReadFailure>& lastReadFailure() const { return lastReadFailure_; }
 
 private:
+    // Reads the materials of a framed library one by one, handing each to `take`;
+    // false, with lastReadFailure_ set, at the first that does not read.
+    bool readMaterials(Framing& framing, const std::function<void(MaterialPtr&&)>& take);
+
     std::string lastError_;
     std::optional<ReadFailure> lastReadFailure_;
 };

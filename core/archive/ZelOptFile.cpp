@@ -44,21 +44,35 @@ bool ZelOptFile::readBytes(OrvexSerializable& object, std::string_view bytes) {
 }
 
 std::string ZelOptFile::toXml(const std::filesystem::path& path) {
+    std::string xml;
+    toXml(path, [&xml](std::string_view piece) { xml.append(piece); });
+    return xml;
+}
+
+void ZelOptFile::toXml(const std::filesystem::path& path, const TextSink& sink) {
+    const std::optional<std::string> bytes = readRegularFile(path);
+    if (!bytes) {
+        lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
+        return;
+    }
+    bytesToXml(*bytes, sink);
+}
+
+void ZelOptFile::bytesToXml(std::string_view bytes, const TextSink& sink) {
     // Every conversion starts from a pristine default sun (sky textures share it).
     resetSharedDefaultSun();
-    const std::optional<std::string> bytes = readRegularFile(path);
-    if (!bytes) return {};
     AllOptions options;
-    if (readBytes(options, *bytes)) {
+    if (readBytes(options, bytes)) {
         std::string xml;
         AssetXmlWriter writer(xml);
         writer.beginDocument();
         options.writeXml(writer, "");
         writer.endDocument();
-        return xml;
+        sink(xml);
+        return;
     }
     // Not a binary options file: the file is taken to be XML text already.
-    return text::decodeStoredText(text::upToFirstNul(*bytes));
+    sink(text::decodeStoredText(text::upToFirstNul(bytes)));
 }
 
 } // namespace OrvexKavorCore

@@ -6,6 +6,7 @@
 // with its version word; the bytes behind the end of the record are padding.
 #include "archive/QuickArchive.hpp"
 #include "archive/Serializable.hpp"
+#include "xml/TextSink.hpp"
 
 #include <filesystem>
 #include <optional>
@@ -29,6 +30,10 @@ public:
 
     // The XML text of the file at `path` (read once), or its pass-through text (see Conversion.hpp).
     std::string toXml(const std::filesystem::path& path);
+    // The same, streamed to `sink`.
+    void toXml(const std::filesystem::path& path, const TextSink& sink);
+    // The same for the bytes of a file.
+    void bytesToXml(std::string_view bytes, const TextSink& sink);
 
     const std::optional<ReadFailure>& lastReadFailure() const { return lastReadFailure_; }
 

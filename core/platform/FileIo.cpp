@@ -2,6 +2,7 @@
 
 #include <cerrno>
 #include <cstring>
+#include <utility>
 #include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -19,11 +20,6 @@ public:
     FileDescriptor(const FileDescriptor&) = delete;
     FileDescriptor& operator=(const FileDescriptor&) = delete;
     int get() const { return fd_; }
-    int release() {
-        const int fd = fd_;
-        fd_ = -1;
-        return fd;
-    }
 
 private:
     int fd_;
@@ -49,46 +45,83 @@ std::optional<std::string> readRegularFile(const std::filesystem::path& path) {
     return content;
 }
 
-bool writeFileAtomically(const std::filesystem::path& path, std::string_view content, std::string* error) {
-    const auto report = [&](std::string what) {
-        if (error) *error = std::move(what) + ": " + std::strerror(errno);
-        return false;
-    };
-    std::filesystem::path temporary = path;
+AtomicFileWriter::AtomicFileWriter(std::filesystem::path target) : target_(std::move(target)) {
+    std::filesystem::path temporary = target_;
     temporary += ".tmp-XXXXXX";
-    std::string pattern = temporary.string();
-    FileDescriptor file(::mkstemp(pattern.data()));
-    if (file.get() < 0) return report("cannot create a temporary file beside " + path.string());
+    temporary_ = temporary.string();
+    fd_ = ::mkstemp(temporary_.data());
+    if (fd_ < 0) {
+        failWith("cannot create a temporary file beside " + target_.string());
+        temporary_.clear();
+    }
+}
 
-    std::size_t done = 0;
-    while (done < content.size()) {
-        const ssize_t n = ::write(file.get(), content.data() + done, content.size() - done);
+AtomicFileWriter::~AtomicFileWriter() {
+    if (fd_ >= 0) ::close(fd_);
+    if (!committed_ && !temporary_.empty()) ::unlink(temporary_.c_str());
+}
+
+bool AtomicFileWriter::failWith(std::string what) {
+    if (error_.empty()) error_ = std::move(what) + ": " + std::strerror(errno);
+    return false;
+}
+
+bool AtomicFileWriter::append(std::string_view data) {
+    constexpr std::size_t kBufferSize = std::size_t{1} << 18;
+    if (!error_.empty()) return false;
+    if (buffer_.size() + data.size() < kBufferSize) {
+        buffer_.append(data);
+        return true;
+    }
+    if (!flush()) return false;
+    if (data.size() < kBufferSize) {
+        buffer_.append(data);
+        return true;
+    }
+    buffer_ = data; // a large piece goes straight out
+    return flush();
+}
+
+bool AtomicFileWriter::flush() {
+    std::string_view rest = buffer_;
+    while (!rest.empty()) {
+        const ssize_t n = ::write(fd_, rest.data(), rest.size());
         if (n < 0 && errno == EINTR) continue;
         if (n <= 0) {
-            const int saved = errno;
-            ::unlink(pattern.c_str());
-            errno = saved;
-            return report("cannot write " + pattern);
+            if (n == 0) errno = EIO;
+            return failWith("cannot write " + temporary_);
         }
-        done += static_cast<std::size_t>(n);
+        rest.remove_prefix(static_cast<std::size_t>(n));
     }
-    if (::fsync(file.get()) != 0 || ::close(file.release()) != 0) {
-        const int saved = errno;
-        ::unlink(pattern.c_str());
-        errno = saved;
-        return report("cannot finish writing " + pattern);
-    }
-    // mkstemp creates the file readable by its owner only; give it the usual mode.
-    const mode_t mask = ::umask(0);
-    ::umask(mask);
-    ::chmod(pattern.c_str(), 0666 & ~mask);
-    if (::rename(pattern.c_str(), path.c_str()) != 0) {
-        const int saved = errno;
-        ::unlink(pattern.c_str());
-        errno = saved;
-        return report("cannot replace " + path.string());
-    }
+    buffer_.clear();
     return true;
+}
+
+bool AtomicFileWriter::commit(std::string* error) {
+    if (error_.empty() && flush()) {
+        const int fd = std::exchange(fd_, -1);
+        const bool synced = ::fsync(fd) == 0;
+        if (!synced) failWith("cannot finish writing " + temporary_);
+        if (::close(fd) != 0 && synced) failWith("cannot finish writing " + temporary_);
+        if (error_.empty()) {
+            // mkstemp creates the file readable by its owner only; give it the usual mode.
+            const mode_t mask = ::umask(0);
+            ::umask(mask);
+            ::chmod(temporary_.c_str(), 0666 & ~mask);
+            if (::rename(temporary_.c_str(), target_.c_str()) == 0)
+                committed_ = true;
+            else
+                failWith("cannot replace " + target_.string());
+        }
+    }
+    if (!committed_ && error) *error = error_;
+    return committed_;
+}
+
+bool writeFileAtomically(const std::filesystem::path& path, std::string_view content, std::string* error) {
+    AtomicFileWriter file(path);
+    file.append(content);
+    return file.commit(error);
 }
 
 } // namespace OrvexKavorCore

@@ -12,6 +12,35 @@ namespace OrvexKavorCore {
 // than the file holds give nullopt. Never blocks on a FIFO.
 std::optional<std::string> readRegularFile(const std::filesystem::path& path);
 
+// A file written piece by piece into a temporary file beside its target and renamed
+// over the target by commit(), so that readers never see a part of it. Destroyed
+// without a successful commit, it removes the temporary and leaves the target as
+// it was.
+class AtomicFileWriter {
+public:
+    explicit AtomicFileWriter(std::filesystem::path target);
+    ~AtomicFileWriter();
+    AtomicFileWriter(const AtomicFileWriter&) = delete;
+    AtomicFileWriter& operator=(const AtomicFileWriter&) = delete;
+
+    // Buffers and writes `data`; false once anything has failed (later calls do nothing).
+    bool append(std::string_view data);
+    // Writes what is buffered, syncs, closes and renames. False, with `error` (when
+    // given) saying why, on any failure along the way or an earlier one.
+    bool commit(std::string* error = nullptr);
+
+private:
+    bool flush();
+    bool failWith(std::string what);
+
+    std::filesystem::path target_;
+    std::string temporary_;
+    int fd_ = -1;
+    std::string buffer_;
+    std::string error_;
+    bool committed_ = false;
+};
+
 // Writes `content` to a temporary file beside `path`, checks every write and the
 // close, then renames it over `path`. On failure the previous file is untouched
 // and `error` (when given) says why.

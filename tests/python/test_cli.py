@@ -123,3 +123,50 @@ def test_version():
     project = re.search(r"project\(Dexmor VERSION ([0-9.]+)", (SOURCE_DIR / "CMakeLists.txt").read_text())
     run = dexmor("--version")
     assert (run.returncode, run.stdout.decode()) == (0, f"dexmor {project.group(1)}\n")
+
+
+def test_parallel_jobs_write_the_same_documents(tmp_path):
+    examples = SOURCE_DIR / "examples"
+    inputs = []
+    for i in range(12):  # the samples and text files under several names
+        source = examples / ("sample.zelmat", "sample.zelopt")[i % 2]
+        target = tmp_path / "in" / f"f{i}{source.suffix}"
+        target.parent.mkdir(exist_ok=True)
+        target.write_bytes(source.read_bytes() if i % 3 else b"<Assets n='%d'/>" % i)
+        inputs.append(target)
+    outputs = {}
+    for jobs in ("1", "2", "5"):
+        run = dexmor("xml", "-o", tmp_path / jobs, "-j", jobs, *inputs)
+        assert (run.returncode, run.stderr) == (0, b"")
+        outputs[jobs] = {p.name: p.read_bytes() for p in (tmp_path / jobs).iterdir()}
+    assert outputs["1"] == outputs["2"] == outputs["5"]
+    assert outputs["1"]["f1.zelopt.xml"].decode() == module_text(inputs[1])
+
+
+@pytest.mark.parametrize("jobs", ["0", "x", "-1", "2000"])
+def test_bad_job_counts_are_usage_errors(tmp_path, jobs):
+    run = dexmor("xml", "-o", tmp_path / "out", "-j", jobs, "a.zelmat", cwd=tmp_path)
+    assert (run.returncode, run.stdout) == (2, b"")
+    assert not (tmp_path / "out").exists()
+
+
+def test_progress_line_only_on_a_terminal(samples, tmp_path):
+    import pty
+
+    run = dexmor("xml", "-o", tmp_path / "plain", *samples)
+    assert run.stderr == b""  # not a terminal: no progress line
+    leader, follower = pty.openpty()
+    try:
+        process = subprocess.run([CLI, "xml", "-o", tmp_path / "tty", *samples], stderr=follower,
+                                 stdout=subprocess.DEVNULL, timeout=60)
+        os.close(follower)
+        shown = b""
+        try:
+            while chunk := os.read(leader, 4096):
+                shown += chunk
+        except OSError:  # the terminal closed
+            pass
+    finally:
+        os.close(leader)
+    assert process.returncode == 0
+    assert b"5/5 files" in shown and shown.endswith(b"\n")

@@ -1,0 +1,10 @@
+#pragma once
+// The subcommands of the tool. Each receives the arguments after its name.
+#include "Output.hpp"
+
+namespace dexmor {
+
+int runXml(Args args);
+int runCheck(Args args);
+
+} // namespace dexmor

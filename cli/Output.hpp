@@ -1,0 +1,43 @@
+#pragma once
+// What the tool's commands share: exit statuses, messages on standard error and
+// checked writes to standard output.
+#include <initializer_list>
+#include <span>
+#include <string_view>
+
+namespace dexmor {
+
+using Args = std::span<const std::string_view>;
+
+// Exit statuses. When several things go wrong, the lower non-zero one wins.
+constexpr int Success = 0;
+constexpr int Failed = 1;   // an output could not be written, a conversion failed, a check found a file not binary
+constexpr int Rejected = 2; // bad usage, or a FILE that cannot be converted
+
+// Writes all of `data` to a file descriptor. False, with errno set, on failure.
+bool writeAll(int fd, std::string_view data);
+
+// One line on standard error: "dexmor: " and the pieces.
+void complain(std::initializer_list<std::string_view> pieces);
+
+// complain(), then a hint at --help; returns Rejected.
+int usageError(std::initializer_list<std::string_view> pieces);
+
+// Standard output, written unbuffered so that a failure shows at the write that
+// meets it; finish() also checks the close.
+class StandardOutput {
+public:
+    bool write(std::string_view data);
+    bool finish();
+
+private:
+    bool used_ = false;
+};
+
+// Writes `text` to standard output: Success, or Failed when it cannot.
+int showText(std::string_view text);
+
+// The help text of the whole tool.
+extern const std::string_view helpText;
+
+} // namespace dexmor

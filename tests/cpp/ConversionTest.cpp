@@ -1,0 +1,122 @@
+// The conversion as the module and the tool call it: a library streamed one
+// material at a time gives the same document as reading it whole, and the
+// diagnosis says what a file holds or why it did not read.
+#include "MaterialTestSupport.hpp"
+
+#include "archive/Conversion.hpp"
+#include "archive/ZelMatFile.hpp"
+#include "brdfs/BRDFs.hpp"
+#include "textures/SkyTexture.hpp"
+#include "xml/AssetXmlWriter.hpp"
+
+#include <fstream>
+#include <iterator>
+#include <sstream>
+
+using namespace materialtest;
+
+namespace {
+
+// A layered material whose diffuse layer's colour is a sky; the sky's record
+// stores the default sun as it is when the file is written.
+MaterialPtr materialWithSky(const std::string& name) {
+    auto diffuse = boost::make_shared<Diffuse_BRDF>();
+    diffuse->colorTex = boost::make_shared<SkyTexture>();
+    auto material = make<MaterialLayeredBRDF>(name);
+    material->layers.push_back(diffuse);
+    return material;
+}
+
+std::string libraryBytes(std::vector<MaterialPtr> materials) {
+    ZelMatFile file;
+    file.materials = std::move(materials);
+    std::ostringstream out;
+    EXPECT_TRUE(file.writeToStream(out)) << file.lastError();
+    return out.str();
+}
+
+// The document as the library read whole gives it.
+std::string wholeDocument(const std::string& bytes) {
+    resetSharedDefaultSun();
+    ZelMatFile file;
+    EXPECT_TRUE(file.readFromBytes(bytes));
+    std::string xml;
+    AssetXmlWriter writer(xml);
+    for (const MaterialPtr& material : file.materials) writeMaterialAssets(writer, material);
+    return xml;
+}
+
+std::string sample(const char* name) {
+    std::ifstream in(std::string(DEXMOR_SOURCE_DIR) + "/examples/" + name, std::ios::binary);
+    return std::string(std::istreambuf_iterator<char>(in), {});
+}
+
+using Conversions = LibraryTest;
+
+TEST_F(Conversions, StreamingSendsEachMaterialAndMatchesTheWholeDocument) {
+    // Both skies store the default sun with turbidity 7.5; the last stored one is
+    // changed to 9.25. Both skies show the default sun as the last sky record
+    // left it, although the first is written before the second is read again.
+    sharedDefaultSun()->turbidity = 7.5f;
+    std::string bytes = libraryBytes({materialWithSky("first"), make<MaterialLayeredBRDF>("plain"),
+                                      materialWithSky("second")});
+    const std::string turbidity("\x00\x00\xF0\x40", 4), changed("\x00\x00\x14\x41", 4); // 7.5f, 9.25f
+    bytes.replace(bytes.rfind(turbidity), 4, changed);
+    const std::string expected = wholeDocument(bytes);
+    EXPECT_NE(expected.find("<value>9.25</value>"), std::string::npos);
+    EXPECT_EQ(expected.find("<value>7.5</value>"), std::string::npos);
+
+    std::vector<std::string> pieces;
+    resetSharedDefaultSun();
+    ZelMatFile().bytesToXml(boost::make_shared<const std::string>(bytes),
+                            [&](std::string_view piece) { pieces.emplace_back(piece); });
+    ASSERT_EQ(pieces.size(), 3u);
+    for (const std::string& piece : pieces) EXPECT_TRUE(piece.starts_with("<Assets>")) << piece;
+    EXPECT_EQ(pieces[0] + pieces[1] + pieces[2], expected);
+    EXPECT_EQ(convertBytesToXml(FileKind::MaterialLibrary, bytes), expected);
+    EXPECT_EQ(convertBytesToXml(FileKind::MaterialLibrary, sample("sample.zelmat")),
+              wholeDocument(sample("sample.zelmat")));
+}
+
+TEST_F(Conversions, ALibraryFailingAtItsLastMaterialSendsNoMaterial) {
+    std::string bytes = libraryBytes({make<MaterialLayeredBRDF>("a"), make<MaterialLayeredBRDF>("b")});
+    const std::size_t secondAt = storedForm(make<MaterialLayeredBRDF>("a")).size();
+    bytes[12 + secondAt] = 99; // the second material's kind id, in the first chunk
+
+    std::vector<std::string> pieces;
+    ZelMatFile file;
+    file.bytesToXml(boost::make_shared<const std::string>(bytes),
+                    [&](std::string_view piece) { pieces.emplace_back(piece); });
+    EXPECT_EQ(pieces, std::vector<std::string>{""}); // the pass-through text: the header starts with a NUL
+    ASSERT_TRUE(file.lastReadFailure());
+    EXPECT_EQ(file.lastReadFailure()->describe(),
+              "material 1: unknown material kind 99 at offset " + std::to_string(secondAt + 4));
+}
+
+TEST_F(Conversions, DiagnosisSaysWhatAFileHoldsOrWhyItDidNotRead) {
+    const Diagnosis library = diagnoseBytes(FileKind::MaterialLibrary, sample("sample.zelmat"));
+    EXPECT_TRUE(library.readsAsBinary);
+    EXPECT_EQ(library.description, "material library, generation 3, 20 materials");
+    const Diagnosis options = diagnoseBytes(FileKind::RenderOptions, sample("sample.zelopt"));
+    EXPECT_TRUE(options.readsAsBinary);
+    EXPECT_EQ(options.description, "render options, version 23");
+
+    // An options file is not a library: its first word is not a library version.
+    const Diagnosis swapped = diagnoseBytes(FileKind::MaterialLibrary, sample("sample.zelopt"));
+    EXPECT_FALSE(swapped.readsAsBinary);
+    ASSERT_TRUE(swapped.failure);
+    EXPECT_EQ(swapped.failure->describe(), "header: unknown file version (1, 23) at offset 0");
+    EXPECT_EQ(swapped.fallbackLength, 1u); // "\x01", the bytes before the first NUL
+
+    const Diagnosis text = diagnoseBytes(FileKind::RenderOptions, "<Assets>caf\xE9</Assets>");
+    EXPECT_EQ(std::tuple(text.opened, text.readsAsBinary), std::tuple(true, false));
+    EXPECT_EQ(text.fallbackLength, std::string("<Assets>caf\xC3\xA9</Assets>").size());
+
+    const Diagnosis missing = diagnose(FileKind::MaterialLibrary, "/nonexistent/x.zelmat");
+    EXPECT_FALSE(missing.opened);
+    EXPECT_EQ(missing.fallbackLength, 0u);
+    ASSERT_TRUE(missing.failure);
+    EXPECT_EQ(missing.failure->reason, "the file cannot be opened");
+}
+
+} // namespace
