@@ -53,7 +53,7 @@ std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(const SharedBytes& sh
                       0);
 
     const std::string_view body = bytes.substr(kHeaderSize);
-    Framing framing{version.second(), count, QuickArchive(0)};
+    Framing framing{version.second(), count, QuickArchive(0), kHeaderSize, shared};
     switch (framing.generation) {
     case 1: {
         // The first generation's writer lost every carriage-return byte; so does its reader.
@@ -77,6 +77,7 @@ std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(const SharedBytes& sh
                               std::to_string(chunks),
                           kChunksAt + present * QuickArchive::kChunkSize, "archive image");
         framing.archive = QuickArchive::viewOf(shared, kChunksAt, chunks * QuickArchive::kChunkSize);
+        framing.archiveStart = kChunksAt;
         break;
     }
     }
@@ -87,12 +88,25 @@ std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(const SharedBytes& sh
     return framing;
 }
 
+std::uint64_t ZelMatFile::Framing::fileOffsetOf(std::uint64_t archivePosition) const {
+    if (generation != 1 || !file) return archiveStart + archivePosition;
+    // The archive holds the body's bytes without their carriage returns: find the
+    // kept byte at that position.
+    std::uint64_t kept = 0;
+    for (std::uint64_t offset = archiveStart; offset < file->size(); ++offset) {
+        if ((*file)[offset] == '\x0D') continue;
+        if (kept == archivePosition) return offset;
+        ++kept;
+    }
+    return file->size() + (archivePosition - kept); // positions past the end count on from it
+}
+
 bool ZelMatFile::readMaterials(Framing& framing, const std::function<void(MaterialPtr&&)>& take) {
     QuickArchive& ar = framing.archive;
     // A material record takes at least a kind id and a version word.
     if (!ar.canHold(framing.count, 8)) {
-        ar.fail("a count of " + std::to_string(framing.count) + " materials cannot fit in the file");
-        lastReadFailure_ = ar.failure();
+        lastReadFailure_ = ReadFailure{"a count of " + std::to_string(framing.count) + " materials cannot fit in the file",
+                                       4, "header"};
         return false;
     }
     for (std::uint32_t i = 0; i < framing.count; ++i) {
@@ -102,7 +116,9 @@ bool ZelMatFile::readMaterials(Framing& framing, const std::function<void(Materi
                 QuickArchive::Scope scope(ar, "material", nullptr, i);
                 ar.fail("the record was rejected");
             }
+            // Failures are recorded at archive positions; the user needs file offsets.
             lastReadFailure_ = ar.failure();
+            lastReadFailure_->offset = framing.fileOffsetOf(lastReadFailure_->offset);
             return false;
         }
         take(std::move(material));

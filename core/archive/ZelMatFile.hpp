@@ -29,15 +29,21 @@ namespace OrvexKavorCore {
 
 class ZelMatFile {
 public:
+    // The bytes of a whole file, shared with the archives that read them in place.
+    using SharedBytes = boost::shared_ptr<const std::string>;
+
     // The archive of a file, split from its 8-byte header.
     struct Framing {
         std::uint16_t generation = 0;
         std::uint32_t count = 0;
         QuickArchive archive;
-    };
+        std::uint64_t archiveStart = 0; // file offset of the archive's first byte
+        SharedBytes file;               // the whole file
 
-    // The bytes of a whole file, shared with the archives that read them in place.
-    using SharedBytes = boost::shared_ptr<const std::string>;
+        // The file offset of an archive position (generation 1 counts the
+        // carriage returns its reader dropped).
+        std::uint64_t fileOffsetOf(std::uint64_t archivePosition) const;
+    };
 
     ZelMatFile() = default;
     virtual ~ZelMatFile() = default;

@@ -36,8 +36,8 @@ void endAsset(AssetXmlWriter& writer) {
 } // namespace lightxml
 
 bool refuseLightVersion(QuickArchive& ar, const char* what, VersionWord version) {
-    return ar.fail(std::string("unknown ") + what + " version " + std::to_string(version.first()) + "." +
-                   std::to_string(version.second()));
+    return ar.fail(std::string("unknown ") + what + " version (" + std::to_string(version.first()) + ", " +
+                   std::to_string(version.second()) + ")");
 }
 
 } // namespace OrvexKavorCore

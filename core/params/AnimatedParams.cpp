@@ -3,6 +3,7 @@
 #include "archive/QuickArchive.hpp"
 
 #include <cmath>
+#include <vector>
 
 namespace OrvexKavorCore {
 
@@ -85,18 +86,20 @@ bool DefAnimTransformParam::readFromArchive(QuickArchive& ar) {
     // Version 1 stored the keys directly, without a record of their own.
     if (!ar.readString(name_)) return false;
     const auto count = ar.get<std::uint32_t>();
+    constexpr std::uint64_t kKeySize = 8 + 48;
+    const std::uint64_t left = ar.remaining() > 4 ? ar.remaining() - 4 : 0; // after the time size
+    if (count > left / kKeySize)
+        return ar.fail(std::to_string(count) + " keys do not fit in the " + std::to_string(left) + " bytes left");
     const auto timeSize = ar.get<std::uint32_t>();
     if (timeSize != 8) return ar.fail("animated transform key times of " + std::to_string(timeSize) + " bytes");
-    constexpr std::uint64_t kKeySize = 8 + 48;
-    if (!ar.canHold(count, kKeySize))
-        return ar.fail(std::to_string(count) + " keys do not fit in the " + std::to_string(ar.remaining()) +
-                       " bytes left");
+    std::vector<AnimatedTransform::Key> keys;
+    keys.reserve(count);
     for (std::uint32_t i = 0; i < count; ++i) {
         const auto time = ar.get<double>();
-        const auto value = ar.get<Transform>();
         if (std::isnan(time)) return ar.fail("animated transform key time that is not a number");
-        value_.setValue(value, time);
+        keys.push_back({time, ar.get<Transform>()});
     }
+    value_.setValues(std::move(keys));
     return true;
 }
 

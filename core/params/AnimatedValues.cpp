@@ -128,12 +128,41 @@ bool AnimatedValue<T>::writeRecord(QuickArchive& ar) const {
 }
 
 template <class T>
+void AnimatedValue<T>::setValues(std::vector<Key> keys) {
+    // Sorting keeps keys of equal time in their order, so the later one wins, and an
+    // existing key goes before the new ones of its time, so its time is kept.
+    std::erase_if(keys, [](const Key& k) { return std::isnan(k.time); });
+    const auto earlier = [](const Key& a, const Key& b) { return a.time < b.time; };
+    std::stable_sort(keys.begin(), keys.end(), earlier);
+    std::vector<Key> merged;
+    merged.reserve(keys_.size() + keys.size());
+    const auto put = [&merged](const Key& k) {
+        if (!merged.empty() && merged.back().time == k.time)
+            merged.back().value = k.value;
+        else
+            merged.push_back(k);
+    };
+    auto old = keys_.begin();
+    for (const Key& k : keys) {
+        while (old != keys_.end() && !earlier(k, *old)) put(*old++);
+        put(k);
+    }
+    while (old != keys_.end()) put(*old++);
+    keys_ = std::move(merged);
+}
+
+template <class T>
 bool AnimatedValue<T>::readFromArchive(QuickArchive& ar) {
     using Traits = detail::AnimatedTraits<T>;
     const auto version = ar.get<VersionWord>();
     resetToDefaults();
     if (!version.is(0, 1)) return ar.fail(std::string("unknown ") + Traits::kWhat + " version");
     const auto count = ar.get<std::uint32_t>();
+    // The keys follow the time size (and the blending flag).
+    constexpr std::uint64_t kBeforeKeys = 4 + (Traits::kStoresInterpolate ? 1 : 0);
+    const std::uint64_t left = ar.remaining() > kBeforeKeys ? ar.remaining() - kBeforeKeys : 0;
+    if (count > left / (kTimeSize + Traits::kStoredSize))
+        return ar.fail(std::to_string(count) + " keys do not fit in the " + std::to_string(left) + " bytes left");
     const auto timeSize = ar.get<std::uint32_t>();
     if (timeSize != kTimeSize)
         return ar.fail(std::string(Traits::kWhat) + " key times of " + std::to_string(timeSize) + " bytes");
@@ -141,15 +170,16 @@ bool AnimatedValue<T>::readFromArchive(QuickArchive& ar) {
         ar.read(interpolate_);
     else
         removeAllKeys();
-    if (!ar.canHold(count, kTimeSize + Traits::kStoredSize))
-        return ar.fail(std::to_string(count) + " keys do not fit in the " + std::to_string(ar.remaining()) +
-                       " bytes left");
+    // Set all at once: one by one, keys stored in descending time would take
+    // quadratic time.
+    std::vector<Key> stored;
+    stored.reserve(count);
     for (std::uint32_t i = 0; i < count; ++i) {
         const auto time = ar.get<double>();
-        const auto value = ar.get<T>();
         if (std::isnan(time)) return ar.fail(std::string(Traits::kWhat) + " key time that is not a number");
-        setValue(value, time);
+        stored.push_back(Key{time, ar.get<T>()});
     }
+    setValues(std::move(stored));
     return true;
 }
 

@@ -65,6 +65,9 @@ public:
     // Appends the record; always succeeds.
     bool writeRecord(QuickArchive& ar) const;
 
+    // Sets every key of `keys` as setValue would one after the other (a later key of
+    // the same time wins), in n log n time.
+    void setValues(std::vector<Key> keys);
     // Only `value` at time 0.
     void setConstant(const T& value);
     std::span<const Key> keys() const { return keys_; }

@@ -33,15 +33,16 @@ bool readList(QuickArchive& ar, std::vector<T>& values, std::string& name, const
     const auto version = ar.get<VersionWord>();
     if (!version.is(0, 1)) return ar.fail(std::string("unknown ") + what + " version");
     const auto count = ar.get<std::uint32_t>();
+    // The element size, then the block (its count and count × size bytes) must fit
+    // in what is left; this also keeps count × size within 32 bits, as archives are
+    // smaller than 4 GiB.
+    if (static_cast<std::uint64_t>(count) * sizeof(T) + 8 > ar.remaining())
+        return ar.fail(std::string(what) + " of " + std::to_string(count) + " elements does not fit in the " +
+                       std::to_string(ar.remaining()) + " bytes left");
     const auto elementSize = ar.get<std::uint32_t>();
     if (elementSize != sizeof(T))
         return ar.fail(std::string(what) + " elements of " + std::to_string(elementSize) + " bytes, expected " +
                        std::to_string(sizeof(T)));
-    // The block (its count, then count × size bytes) must fit in what is left; this
-    // also keeps count × size within 32 bits, as archives are smaller than 4 GiB.
-    if (static_cast<std::uint64_t>(count) * sizeof(T) + 4 > ar.remaining())
-        return ar.fail(std::string(what) + " of " + std::to_string(count) + " elements does not fit in the " +
-                       std::to_string(ar.remaining()) + " bytes left");
     const auto capacity = static_cast<std::uint32_t>(count * sizeof(T));
     values.resize(count);
     const auto stored = ar.readBytes(values.data(), capacity, false);

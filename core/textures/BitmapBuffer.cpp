@@ -35,8 +35,8 @@ bool BitmapBuffer::writeToArchive(QuickArchive& ar) {
 bool BitmapBuffer::readFromArchive(QuickArchive& ar) {
     const auto version = ar.get<VersionWord>();
     if (version != kVersion)
-        return ar.fail("unknown bitmap buffer version " + std::to_string(version.first()) + "." +
-                       std::to_string(version.second()));
+        return ar.fail("unknown bitmap buffer version (" + std::to_string(version.first()) + ", " +
+                       std::to_string(version.second()) + ")");
     ar.read(filter_type);
     ar.read(filter_blur);
     ar.read(gamma);

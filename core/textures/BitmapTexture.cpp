@@ -45,10 +45,11 @@ bool BitmapTexture::readFromArchive(QuickArchive& ar) {
     const auto version = ar.get<VersionWord>();
     resetToDefaults();
     if (!accepts(version)) return texture::refuseVersion(ar, kInfo.what, version);
+    // Each kind id is checked as soon as it is read, so a failure points at it.
     const auto uvwKind = ar.get<std::int32_t>();
-    const auto bitmapKind = ar.get<std::int32_t>();
     const UVWPtr newUvwgen = createUVW(uvwKind);
     if (!newUvwgen) return ar.fail("unknown UVW generator kind " + std::to_string(uvwKind) + " of the uvwgen");
+    const auto bitmapKind = ar.get<std::int32_t>();
     const BitmapPtr newBitmap = createBitmap(bitmapKind);
     if (!newBitmap) return ar.fail("unknown bitmap kind " + std::to_string(bitmapKind) + " of the bitmap");
     uvwgen = newUvwgen;

@@ -15,8 +15,8 @@ constexpr std::array<std::string_view, 4> kMappingNames = {"angular", "cubic", "
 
 // Records the refusal of a version word and returns false.
 bool unknownVersion(QuickArchive& ar, const char* what, VersionWord version) {
-    return ar.fail(std::string("unknown ") + what + " version " + std::to_string(version.first()) + "." +
-                   std::to_string(version.second()));
+    return ar.fail(std::string("unknown ") + what + " version (" + std::to_string(version.first()) + ", " +
+                   std::to_string(version.second()) + ")");
 }
 
 // Reads a components record, labelled for failure reports.

@@ -90,7 +90,7 @@ TEST_F(Conversions, ALibraryFailingAtItsLastMaterialSendsNoMaterial) {
     EXPECT_EQ(pieces, std::vector<std::string>{""}); // the pass-through text: the header starts with a NUL
     ASSERT_TRUE(file.lastReadFailure());
     EXPECT_EQ(file.lastReadFailure()->describe(),
-              "material 1: unknown material kind 99 at offset " + std::to_string(secondAt + 4));
+              "material 1: unknown material kind 99 at offset " + std::to_string(12 + secondAt + 4));
 }
 
 TEST_F(Conversions, DiagnosisSaysWhatAFileHoldsOrWhyItDidNotRead) {

@@ -30,7 +30,7 @@ def files(tmp_path):
 def test_diagnose_gives_none_or_the_reason(files):
     assert Dexmor.diagnose(files["library"]) is None
     assert Dexmor.diagnose(str(files["options"])) is None
-    assert Dexmor.diagnose(files["damaged"]) == "material 0: unknown material kind 41 at offset 4"
+    assert Dexmor.diagnose(files["damaged"]) == "material 0: unknown material kind 41 at offset 16"
     assert Dexmor.diagnose(files["text"]).startswith("unknown options version")
     assert Dexmor.diagnose(files["missing"]) == "the file cannot be opened at offset 0"
     with pytest.raises(Dexmor.error, match=r"\.zelmat.*\.zelopt"):
@@ -47,7 +47,7 @@ def test_check_prints_one_line_per_file(files):
     assert lines == [
         f"{files['library']}: material library, generation 3, 20 materials",
         f"{files['options']}: render options, version 23",
-        f"{files['damaged']}: not readable as binary: material 0: unknown material kind 41 at offset 4;"
+        f"{files['damaged']}: not readable as binary: material 0: unknown material kind 41 at offset 16;"
         " the conversion returns the empty text",
         f"{files['text']}: not readable as binary: {Dexmor.diagnose(files['text'])};"
         " the conversion returns the file's text (9 bytes)",
