@@ -163,9 +163,19 @@ PyObject* textObject(std::string_view text) {
 PyObject* convertFile(PyObject* args, const Call& call) {
     std::optional<FileArgument> file = fileArgument(args, call);
     if (!file) return nullptr;
-    std::string xml;
-    withoutInterpreterLock([&] { xml = core::convertToXml(file->kind, std::filesystem::path(std::move(file->path))); });
-    return textObject(core::text::upToFirstNul(xml));
+    // Each thread keeps its text buffer between calls, so converting many files
+    // does not map, fault in and unmap fresh memory for every document; the
+    // buffer of a very large document is let go.
+    constexpr std::size_t kKeptCapacity = std::size_t{64} << 20;
+    thread_local std::string xml;
+    xml.clear();
+    withoutInterpreterLock([&] {
+        core::convertToXml(file->kind, std::filesystem::path(std::move(file->path)),
+                           [](std::string_view piece) { xml.append(piece); });
+    });
+    PyObject* result = textObject(core::text::upToFirstNul(xml));
+    if (xml.capacity() > kKeptCapacity) std::string().swap(xml);
+    return result;
 }
 
 PyObject* diagnoseFile(PyObject* args, const Call& call) {

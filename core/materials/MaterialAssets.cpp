@@ -12,19 +12,27 @@ namespace OrvexKavorCore {
 
 namespace {
 
+// The material as `Kind` when its kind id says it is one; the id picks the one
+// cast worth trying, so a search does not try every kind in turn.
+template <class Kind>
+const Kind* as(const BaseMaterial& m, std::int32_t kindId) {
+    return kindId == Kind::kInfo.kind ? dynamic_cast<const Kind*>(&m) : nullptr;
+}
+
 // The materials the search looks through, in order.
 std::vector<MaterialPtr> lookedThrough(const BaseMaterial& m) {
-    if (const auto* bump = dynamic_cast<const MaterialBump*>(&m)) return {bump->baseMtl};
-    if (const auto* env = dynamic_cast<const MaterialOverrideEnvironment*>(&m)) return {env->baseMtl};
-    if (const auto* displaced = dynamic_cast<const MaterialDisplaced*>(&m)) return {displaced->baseMtl};
-    if (const auto* exclusion = dynamic_cast<const MaterialObjectExclusion*>(&m)) return {exclusion->baseMtl};
-    if (const auto* alpha = dynamic_cast<const MaterialAlphaContribution*>(&m)) return {alpha->baseMtl};
-    if (const auto* toon = dynamic_cast<const MaterialToon*>(&m)) return {toon->baseMtl};
-    if (const auto* linked = dynamic_cast<const MaterialLinked*>(&m)) return {linked->linkedMaterial};
-    if (const auto* twoSided = dynamic_cast<const Material2Sided*>(&m)) return {twoSided->front, twoSided->back};
-    if (const auto* host = dynamic_cast<const MaterialSkp2Sided*>(&m)) return {host->front, host->back};
-    if (const auto* blend = dynamic_cast<const MaterialAngleBlend*>(&m)) return {blend->mtlOne, blend->mtlTwo};
-    if (const auto* reference = dynamic_cast<const MaterialReference*>(&m)) return {reference->resolve()};
+    const std::int32_t kind = m.kindId();
+    if (const auto* bump = as<MaterialBump>(m, kind)) return {bump->baseMtl};
+    if (const auto* env = as<MaterialOverrideEnvironment>(m, kind)) return {env->baseMtl};
+    if (const auto* displaced = as<MaterialDisplaced>(m, kind)) return {displaced->baseMtl};
+    if (const auto* exclusion = as<MaterialObjectExclusion>(m, kind)) return {exclusion->baseMtl};
+    if (const auto* alpha = as<MaterialAlphaContribution>(m, kind)) return {alpha->baseMtl};
+    if (const auto* toon = as<MaterialToon>(m, kind)) return {toon->baseMtl};
+    if (const auto* linked = as<MaterialLinked>(m, kind)) return {linked->linkedMaterial};
+    if (const auto* twoSided = as<Material2Sided>(m, kind)) return {twoSided->front, twoSided->back};
+    if (const auto* host = as<MaterialSkp2Sided>(m, kind)) return {host->front, host->back};
+    if (const auto* blend = as<MaterialAngleBlend>(m, kind)) return {blend->mtlOne, blend->mtlTwo};
+    if (const auto* reference = as<MaterialReference>(m, kind)) return {reference->resolve()};
     return {}; // layered, single, multi, instance
 }
 
