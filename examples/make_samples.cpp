@@ -5,73 +5,19 @@
 // spaces, digits and letters beyond ASCII, and OUTPUT_DIR/sample.zelopt, a
 // render-options file with settings changed in every section and an environment
 // lit by a sky and a bitmap.
+#include "SampleBuilders.hpp"
+
 #include "archive/ZelMatFile.hpp"
 #include "archive/ZelOptFile.hpp"
-#include "options/AllOptions.hpp"
-#include "brdfs/BRDFs.hpp"
-#include "materials/Materials.hpp"
-#include "textures/BitmapBuffer.hpp"
-#include "textures/Textures.hpp"
-#include "textures/UVWGenerators.hpp"
-
-#include <boost/make_shared.hpp>
 
 #include <cstdio>
 #include <filesystem>
 #include <string>
 
 using namespace OrvexKavorCore;
+using namespace OrvexKavorCore::samples;
 
 namespace {
-
-template <class T>
-boost::shared_ptr<T> make() {
-    return boost::make_shared<T>();
-}
-
-template <class M>
-boost::shared_ptr<M> named(const std::string& name) {
-    auto material = make<M>();
-    material->name = name;
-    return material;
-}
-
-TexturePtr bitmap(const std::string& file) {
-    TexturePtr texture = makeBitmapTexture(file);
-    return texture;
-}
-
-TexturePtr noise(float size) {
-    auto texture = make<NoiseTexture>();
-    texture->uvwgen = make<GenChannelUVW>();
-    texture->size = size;
-    texture->octaves = 5;
-    texture->color2 = {0.2f, 0.15f, 0.1f};
-    return texture;
-}
-
-TexturePtr checker() {
-    auto texture = make<CheckerTexture>();
-    auto uvw = make<GenPlanarWorldUVW>();
-    uvw->uvwComponents.x_scale = 4.0f;
-    uvw->uvwComponents.y_scale = 4.0f;
-    uvw->uvwComponents.z_rotation = 45.0f;
-    texture->uvwgen = uvw;
-    return texture;
-}
-
-BRDFPtr diffuse(Color color, TexturePtr colorTex = {}) {
-    auto layer = make<Diffuse_BRDF>();
-    layer->color = color;
-    layer->colorTex = std::move(colorTex);
-    return layer;
-}
-
-boost::shared_ptr<MaterialLayeredBRDF> layered(const std::string& name, std::initializer_list<BRDFPtr> layers) {
-    auto material = named<MaterialLayeredBRDF>(name);
-    material->layers.assign(layers);
-    return material;
-}
 
 ZelMatFile sampleLibrary() {
     ZelMatFile file;
@@ -199,67 +145,6 @@ ZelMatFile sampleLibrary() {
     file.add(brick);
 
     return file;
-}
-
-AllOptions sampleOptions() {
-    AllOptions options;
-    KavorUtils::KavorParams& p = options.params;
-    p.imageSampler.type = 1;
-    p.imageSampler.dmc_maxSubdivs = 16;
-    p.imageFilter.on = 1;
-    p.camera.type = 0;
-    p.cameraDof.on = 1;
-    p.cameraDof.subdivs = 12;
-    p.motionBlur.on = 1;
-    p.motionBlur.duration = 0.5f;
-    p.gi.on = 1;
-    p.gi.primary_engine = 0;
-    p.gi.secondary_engine = 3;
-    p.irradianceMap.min_rate = -4;
-    p.irradianceMap.max_rate = -1;
-    p.photonMap.bounces = 6;
-    p.lightCache.subdivs = 1500;
-    p.caustics.on = 1;
-    p.raycaster.maxLevels = 80;
-    p.regionsGenerator.xc = 32;
-    p.regionsGenerator.yc = 32;
-    p.dmcSampler.adaptive_amount = 0.9f;
-    p.colorMapping.type = 6;
-    p.colorMapping.gamma = 2.2f;
-    p.options.light_doDefaultLights = 0;
-    p.defaultDisplacement.edgeLength = 2.0f;
-    options.frameData.height = 300.0f;
-    options.frameData.focal_dist = 150.0f;
-    options.frameData.dark_mult = 1.2f;
-    options.frameData.bmp_width = 1920;
-    options.frameData.bmp_height = 1080;
-
-    options.img_width = 1920;
-    options.img_height = 1080;
-    options.filter_kind = 1;
-    options.fov = 60.0f;
-    options.gamma_correct_rgb = 1;
-    options.input_gamma = 2.2f;
-    options.img_file = "renders/Atrium Ansicht \xC3\x9C" "bersicht.png";
-    options.im_file = "cache/atrium.vrmap";
-    options.channels.push_back(117); // ZDepth
-    options.channels.push_back(101); // Diffuse
-
-    options.use_bg = 1;
-    options.bg_tex = boost::make_shared<SkyTexture>();
-    options.bg_tex_mult = 0.8f;
-    options.use_gi = 1;
-    options.gi_tex = boost::make_shared<SkyTexture>();
-    options.use_reflect = 1;
-    options.reflect_tex = bitmap("hdri/courtyard.hdr");
-    options.reflect_tex_mult = 1.5f;
-    options.refract_color = {0.1f, 0.2f, 0.3f};
-
-    options.physical_on = 1;
-    options.camera.f_number = 5.6f;
-    options.camera.focal_length.setConstant(35.0f);
-    options.camera.focal_length.setValue(50.0f, 10.0);
-    return options;
 }
 
 } // namespace

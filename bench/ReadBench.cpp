@@ -1,0 +1,82 @@
+// Throughput of reading records from a file's bytes and of the whole conversion
+// from bytes to XML, for a material library and a render-options file.
+#include "BenchCorpus.hpp"
+
+#include "archive/Conversion.hpp"
+#include "archive/ZelOptFile.hpp"
+
+#include <benchmark/benchmark.h>
+
+#include <cstdint>
+#include <string>
+
+using namespace OrvexKavorCore;
+
+namespace {
+
+constexpr std::size_t kMaterials = 1000;
+
+// A library like the benchmark files, and options with varied settings.
+const std::string& libraryFile() {
+    static const std::string bytes = [] {
+        ZelMatFile library = bench::makeLibrary(kMaterials, 20240611);
+        return bench::libraryBytes(library);
+    }();
+    return bytes;
+}
+
+const std::string& optionsFile() {
+    static const std::string bytes = [] {
+        AllOptions options = bench::makeOptions(20240611);
+        return bench::optionsBytes(options);
+    }();
+    return bytes;
+}
+
+// Bytes per second of the file read.
+void BM_ReadLibrary(benchmark::State& state) {
+    const std::string& bytes = libraryFile();
+    for (auto _ : state) {
+        ZelMatFile file;
+        if (!file.readFromBytes(bytes)) state.SkipWithError("the library does not read");
+        benchmark::DoNotOptimize(file.materials.data());
+    }
+    state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * bytes.size()));
+    state.counters["materials"] =
+        benchmark::Counter(double(state.iterations() * kMaterials), benchmark::Counter::kIsRate);
+}
+BENCHMARK(BM_ReadLibrary)->Unit(benchmark::kMillisecond);
+
+// The whole conversion of a file's bytes; bytes per second of XML made.
+void convert(benchmark::State& state, FileKind kind, const std::string& bytes) {
+    std::size_t made = 0;
+    for (auto _ : state) {
+        const std::string xml = convertBytesToXml(kind, bytes);
+        made += xml.size();
+        benchmark::DoNotOptimize(xml.data());
+    }
+    state.SetBytesProcessed(static_cast<std::int64_t>(made));
+}
+
+void BM_ConvertLibrary(benchmark::State& state) {
+    convert(state, FileKind::MaterialLibrary, libraryFile());
+    state.counters["materials"] =
+        benchmark::Counter(double(state.iterations() * kMaterials), benchmark::Counter::kIsRate);
+}
+BENCHMARK(BM_ConvertLibrary)->Unit(benchmark::kMillisecond);
+
+void BM_ReadOptions(benchmark::State& state) {
+    const std::string& bytes = optionsFile();
+    for (auto _ : state) {
+        AllOptions options;
+        if (!ZelOptFile().readBytes(options, bytes)) state.SkipWithError("the options do not read");
+        benchmark::DoNotOptimize(&options);
+    }
+    state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * bytes.size()));
+}
+BENCHMARK(BM_ReadOptions)->Unit(benchmark::kMicrosecond);
+
+void BM_ConvertOptions(benchmark::State& state) { convert(state, FileKind::RenderOptions, optionsFile()); }
+BENCHMARK(BM_ConvertOptions)->Unit(benchmark::kMicrosecond);
+
+} // namespace
