@@ -307,13 +307,18 @@ bool QuickArchive::loadFromFile(const std::filesystem::path& path) {
 }
 
 std::string QuickArchive::recordPath() const {
+    // "what index name" per level, the words present joined by single spaces.
     std::string path;
     for (const Frame& frame : frames_) {
         if (!path.empty()) path += " / ";
-        std::string part = frame.what ? frame.what : "";
-        if (frame.index >= 0) part += (part.empty() ? "" : " ") + std::to_string(frame.index);
-        if (frame.name) part += (part.empty() ? "" : " ") + std::string(frame.name);
-        path += part;
+        const std::size_t levelStart = path.size();
+        const auto word = [&](std::string_view text) {
+            if (path.size() > levelStart) path += ' ';
+            path += text;
+        };
+        if (frame.what) word(frame.what);
+        if (frame.index >= 0) word(std::to_string(frame.index));
+        if (frame.name) word(frame.name);
     }
     return path;
 }
