@@ -87,14 +87,21 @@ SunLight* SkyTexture::sunLight() const {
 
 bool SkyTexture::writeToArchive(QuickArchive& ar) {
     ar.write(VersionWord::make(0, kInfo.version));
+    // A sun that carries the default sun's identifier is the default sun: the sky
+    // points at the shared one before anything is written, so that the sky's own
+    // sun record and the default sun record agree and the record reads back to a
+    // sky that writes the same bytes.
+    const boost::shared_ptr<SunLight> defaultSun = sharedDefaultSun();
     SunLight* own = sunLight();
+    const bool isDefault = own && text::equalsIgnoringAsciiCase(own->identifier, defaultSun->identifier);
+    if (isDefault) {
+        sun = defaultSun;
+        own = defaultSun.get();
+    }
     ar.write(own != nullptr);
     if (own && !own->writeToArchive(ar)) return false;
     if (!record::writeFields(ar, *this, fields(), kInfo.version)) return false;
-    const boost::shared_ptr<SunLight> defaultSun = sharedDefaultSun();
     if (!defaultSun->writeToArchive(ar)) return false;
-    const bool isDefault = own && text::equalsIgnoringAsciiCase(own->identifier, defaultSun->identifier);
-    if (isDefault) sun = defaultSun;
     ar.write(isDefault);
     return true;
 }

@@ -1,6 +1,7 @@
 // Keyed values, the animated parameters that present them to the renderer, and
 // their use in record tables.
-#include "archive/QuickArchive.hpp"
+#include "TestSupport.hpp"
+
 #include "archive/Record.hpp"
 #include "params/AnimatedParams.hpp"
 #include "params/AnimatedValues.hpp"
@@ -12,19 +13,13 @@
 #include <vector>
 
 using namespace OrvexKavorCore;
+using namespace testsupport;
 
 namespace {
 
-using ByteVec = std::vector<std::uint8_t>;
+using ByteVec = ByteVector;
 constexpr double kInf = std::numeric_limits<double>::infinity();
 constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
-
-ByteVec bytesOf(const QuickArchive& ar) {
-    QuickArchive copy = ar;
-    ByteVec out(copy.writePosition());
-    copy.getRaw(out.data(), out.size());
-    return out;
-}
 
 // Byte images of records, assembled by hand.
 struct Bytes {

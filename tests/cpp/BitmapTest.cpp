@@ -1,7 +1,7 @@
 // Bitmap buffers: the factory, the record, comparison of file names and the XML asset.
-#include "archive/QuickArchive.hpp"
+#include "TestSupport.hpp"
+
 #include "textures/BitmapBuffer.hpp"
-#include "xml/AssetXmlWriter.hpp"
 
 #include <boost/make_shared.hpp>
 #include <gtest/gtest.h>
@@ -9,21 +9,11 @@
 #include <cstdint>
 #include <random>
 #include <string>
-#include <vector>
 
 using namespace OrvexKavorCore;
+using namespace testsupport;
 
 namespace {
-
-using ByteVector = std::vector<std::uint8_t>;
-
-ByteVector recordOf(BaseBitmap& bitmap) {
-    QuickArchive ar;
-    EXPECT_TRUE(bitmap.writeToArchive(ar));
-    ByteVector out(ar.writePosition());
-    ar.getRaw(out.data(), out.size());
-    return out;
-}
 
 boost::shared_ptr<BitmapBuffer> buffer(std::string file, std::int32_t filterType = 1, float blur = 0.15f,
                                        float gamma = 1.0f) {
@@ -37,45 +27,30 @@ boost::shared_ptr<BitmapBuffer> buffer(std::string file, std::int32_t filterType
 
 } // namespace
 
-TEST(Bitmap, FactoryAndFilterNames) {
-    const BitmapPtr made = createBitmap(0);
-    ASSERT_TRUE(made);
-    EXPECT_EQ(made->kindId(), 0);
-    EXPECT_EQ(made->pluginType(), "BitmapBuffer");
-    EXPECT_EQ(made->assetType(), "bitmap");
+TEST(Bitmap, FactoryFilterNamesAndDefaultRecord) {
+    ASSERT_TRUE(createBitmap(0));
     for (std::int32_t kind : {1, -1, INT32_MIN}) EXPECT_FALSE(createBitmap(kind)) << kind;
-
     // So a bitmap member naming kind 1 is refused.
     const ByteVector member = {1, 0, 0, 0, 0, 0, 1, 0};
     QuickArchive ar(member.data(), member.size());
     BitmapPtr bitmap;
     EXPECT_FALSE(readMember(ar, bitmap, "bitmap"));
-    ASSERT_TRUE(ar.failure());
-    EXPECT_NE(ar.failure()->reason.find("kind 1"), std::string::npos) << ar.failure()->describe();
+    EXPECT_NE(failureOf(ar).find("kind 1"), std::string::npos) << failureOf(ar);
 
-    EXPECT_EQ(bitmapFilterName(0), "No filter");
-    EXPECT_EQ(bitmapFilterName(1), "Mip-map");
-    EXPECT_EQ(bitmapFilterName(2), "Summed-area");
+    const char* names[] = {"No filter", "Mip-map", "Summed-area"};
+    for (std::int32_t type = 0; type < 3; ++type) EXPECT_EQ(bitmapFilterName(type), names[type]);
     for (std::int32_t type : {-1, 3, INT32_MIN, INT32_MAX}) EXPECT_EQ(bitmapFilterName(type), "") << type;
-}
 
-TEST(Bitmap, DefaultRecord) {
-    BitmapBuffer b;
-    EXPECT_EQ(recordOf(b), (ByteVector{
-                               0x00, 0x00, 0x01, 0x00, // version 0.1
-                               0x01, 0x00, 0x00, 0x00, // filter_type 1
-                               0x9A, 0x99, 0x19, 0x3E, // filter_blur 0.15
-                               0x00, 0x00, 0x80, 0x3F, // gamma 1.0
-                               0x00, 0x00, 0x00, 0x00, // empty file
-                           }));
+    BitmapBuffer b; // version, filter_type 1, filter_blur 0.15, gamma 1, empty file
+    EXPECT_EQ(recordOf(b), (ByteVector{0, 0, 1, 0, 1, 0, 0, 0, 0x9A, 0x99, 0x19, 0x3E, 0, 0, 0x80, 0x3F, 0, 0, 0, 0}));
 }
 
 // File names built from ASCII, markup characters and two-, three- and four-byte
-// UTF-8 sequences survive unchanged.
-TEST(Bitmap, RandomRoundTripsAndClones) {
+// UTF-8 sequences survive unchanged; every stored byte takes part in comparison.
+TEST(Bitmap, RandomRoundTripsClonesAndComparison) {
     std::mt19937 rng(7);
-    const char* const pieces[] = {
-        "a", "B", "\\", " ", "&", "<", ".png", "\xC3\xA9", "\xE6\x9C\xA8", "\xF0\x9F\x8C\xB3"};
+    const char* const pieces[] = {"a", "B", "\\", " ", "&", "<", ".png", "\xC3\xA9", "\xE6\x9C\xA8",
+                                  "\xF0\x9F\x8C\xB3"};
     std::uniform_int_distribution<std::size_t> piece(0, std::size(pieces) - 1), length(0, 40);
     std::uniform_real_distribution<float> real(-100.0f, 100.0f);
     std::uniform_int_distribution<std::int32_t> integer(INT32_MIN, INT32_MAX);
@@ -86,9 +61,7 @@ TEST(Bitmap, RandomRoundTripsAndClones) {
         const ByteVector bytes = recordOf(*original);
 
         BitmapBuffer copy;
-        QuickArchive ar(bytes.data(), bytes.size());
-        ASSERT_TRUE(copy.readFromArchive(ar));
-        EXPECT_EQ(ar.readPosition(), bytes.size());
+        ASSERT_TRUE(readInto(copy, bytes));
         EXPECT_EQ(copy.file, file);
         EXPECT_TRUE(copy.isEqual(original));
         EXPECT_EQ(recordOf(copy), bytes);
@@ -97,6 +70,7 @@ TEST(Bitmap, RandomRoundTripsAndClones) {
         ASSERT_NE(clone, original);
         EXPECT_TRUE(clone->isEqual(original));
         EXPECT_EQ(recordOf(*clone), bytes);
+        if (round < 3) expectEveryStoredByteCompared(original, bytes, [] { return createBitmap(0); });
     }
 }
 
@@ -105,57 +79,25 @@ TEST(Bitmap, ComparisonIgnoresTheCaseOfAsciiLettersInFileNamesOnly) {
     EXPECT_TRUE(oak->isEqual(buffer("c:\\maps\\oak.png")));
     EXPECT_FALSE(oak->isEqual(buffer("C:\\Maps\\Oak.PNG ")));
     EXPECT_FALSE(buffer("\xC3\x84.png")->isEqual(buffer("\xC3\xA4.png"))); // Ä and ä
-
-    EXPECT_FALSE(oak->isEqual(buffer("C:\\Maps\\Oak.PNG", 2)));
-    EXPECT_FALSE(oak->isEqual(buffer("C:\\Maps\\Oak.PNG", 1, 0.5f)));
-    EXPECT_FALSE(oak->isEqual(buffer("C:\\Maps\\Oak.PNG", 1, 0.15f, 2.2f)));
     EXPECT_FALSE(oak->isEqual(BitmapPtr()));
 }
 
 TEST(Bitmap, RefusedRecordsSayWhy) {
     // Version 0.2: refused, and the fields keep their values.
-    const ByteVector version2 = {0, 0, 2, 0, 2, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0};
     const auto b = buffer("keep.png", 0, 0.5f, 2.0f);
-    QuickArchive ar(version2.data(), version2.size());
-    EXPECT_FALSE(b->readFromArchive(ar));
-    ASSERT_TRUE(ar.failure());
-    EXPECT_NE(ar.failure()->reason.find("version"), std::string::npos) << ar.failure()->reason;
+    QuickArchive ar;
+    EXPECT_FALSE(readInto(*b, Image{}.version(0, 2).i32(2).f32({0, 0}).u32(0).bytes, &ar));
+    EXPECT_NE(failureOf(ar).find("version"), std::string::npos) << failureOf(ar);
     EXPECT_TRUE(b->isEqual(buffer("keep.png", 0, 0.5f, 2.0f)));
-
     // A file name longer than the data that remains.
-    const ByteVector longName = {0, 0, 1, 0, 1, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0xFF, 0xFF, 0xFF, 0x7F, 'a'};
-    QuickArchive ar2(longName.data(), longName.size());
-    EXPECT_FALSE(b->readFromArchive(ar2));
-    EXPECT_TRUE(ar2.failure());
+    EXPECT_FALSE(readInto(*b, Image{}.version(0, 1).i32(1).f32({0, 0}).u32(0x7FFFFFFF).u8('a').bytes, &ar));
+    EXPECT_TRUE(ar.failed());
 }
 
 TEST(BitmapXml, AssetText) {
-    const auto b = buffer("C:\\Texturen\\Gr\xC3\xB6\xC3\x9F"
-                          "e_\xE6\x9C\xA8.png",
-                          BitmapBuffer::kSummedArea, 0.25f, 2.2f);
-    std::string out;
-    AssetXmlWriter writer(out);
-    b->writeXml(writer, "/Oak/diffuse/buffer");
-    EXPECT_EQ(writer.depth(), 0u);
-    EXPECT_EQ(out, R"(  <Asset layout="" renderer="kavor" type="bitmap" url="/Oak/diffuse/buffer" >
-    <plugin>
-      <kavorplugin name="BitmapBuffer" type="bitmap">
-        <parameters>
-          <parameter type="integer" name="filter_type" listType="none" label="filter_type">
-            <value>2</value>
-          </parameter>
-          <parameter type="float" name="filter_blur" listType="none" label="filter_blur">
-            <value>0.25</value>
-          </parameter>
-          <parameter type="float" name="gamma" listType="none" label="gamma">
-            <value>2.2</value>
-          </parameter>
-          <parameter type="string" name="file" listType="none" label="file">
-            <value>C:\Texturen\Größe_木.png</value>
-          </parameter>
-        </parameters>
-      </kavorplugin>
-    </plugin>
-  </Asset>
-)");
+    const std::string file = "C:\\Texturen\\Gr\xC3\xB6\xC3\x9F" "e_\xE6\x9C\xA8.png";
+    const auto b = buffer(file, BitmapBuffer::kSummedArea, 0.25f, 2.2f);
+    EXPECT_EQ(xmlOf(*b, "/Oak/diffuse/buffer"),
+              assetXml("/Oak/diffuse/buffer", "bitmap", "BitmapBuffer",
+                       "integer filter_type 2|float filter_blur 0.25|float gamma 2.2|string file " + file));
 }

@@ -1,6 +1,6 @@
 // The physical camera and the render view: their records of every version,
 // assembled here byte by byte, and the render view's asset.
-#include "TextureTestSupport.hpp"
+#include "TestSupport.hpp"
 
 #include "options/PhysicalCamera.hpp"
 #include "options/RenderView.hpp"
@@ -11,7 +11,7 @@
 #include <string>
 
 using namespace OrvexKavorCore;
-using namespace texturetest;
+using namespace testsupport;
 
 namespace {
 
@@ -155,18 +155,5 @@ TEST(RenderView, Asset) {
     view.img_width = 1920;
     view.img_height = -1;
     EXPECT_EQ(xmlOf(view, "/scene"),
-              "  <Asset layout=\"\" renderer=\"kavor\" type=\"settings\" url=\"/scene/RenderView\" >\n"
-              "    <plugin>\n"
-              "      <kavorplugin name=\"RenderView\" type=\"settings\">\n"
-              "        <parameters>\n"
-              "          <parameter type=\"integer\" name=\"img_width\" listType=\"none\" label=\"img_width\">\n"
-              "            <value>1920</value>\n"
-              "          </parameter>\n"
-              "          <parameter type=\"integer\" name=\"img_height\" listType=\"none\" label=\"img_height\">\n"
-              "            <value>-1</value>\n"
-              "          </parameter>\n"
-              "        </parameters>\n"
-              "      </kavorplugin>\n"
-              "    </plugin>\n"
-              "  </Asset>\n");
+              assetXml("/scene/RenderView", "settings", "RenderView", "integer img_width 1920|integer img_height -1"));
 }

@@ -1,6 +1,7 @@
 // List parameters and map channels: records of the stored lists, and walks through
 // every list class as a renderer makes them.
-#include "archive/QuickArchive.hpp"
+#include "TestSupport.hpp"
+
 #include "params/GeomMapChannel.hpp"
 #include "params/NestedListParams.hpp"
 #include "params/SerialListParams.hpp"
@@ -12,36 +13,13 @@
 #include <vector>
 
 using namespace OrvexKavorCore;
+using namespace testsupport;
 
 namespace {
 
-using ByteVec = std::vector<std::uint8_t>;
-
-ByteVec bytesOf(const QuickArchive& ar) {
-    QuickArchive copy = ar;
-    ByteVec out(copy.writePosition());
-    copy.getRaw(out.data(), out.size());
-    return out;
-}
-
 // Record header of a stored list: version, element count, element size, block size.
-ByteVec listHeader(std::uint16_t version, std::uint32_t count, std::uint32_t size, std::uint32_t block) {
-    QuickArchive ar;
-    ar.write(VersionWord::make(0, version));
-    for (std::uint32_t v : {count, size, block}) ar.write(v);
-    return bytesOf(ar);
-}
-
-ByteVec operator+(ByteVec a, const ByteVec& b) {
-    a.insert(a.end(), b.begin(), b.end());
-    return a;
-}
-
-template <class T>
-ByteVec le(T v) {
-    QuickArchive ar;
-    ar.write(v);
-    return bytesOf(ar);
+Image listHeader(std::uint16_t version, std::uint32_t count, std::uint32_t size, std::uint32_t block) {
+    return Image{}.version(0, version).u32(count).u32(size).u32(block);
 }
 
 class Plugin : public PluginBase {};
@@ -51,15 +29,10 @@ class Plugin : public PluginBase {};
 TEST(ListParams, IntegerListRecordImage) {
     DefSerialIntListParam faces("faces");
     faces.values() = {1, 2, 3};
-    QuickArchive ar;
-    ASSERT_TRUE(faces.writeToArchive(ar));
-    const ByteVec expected = listHeader(1, 3, 4, 12) + ByteVec{1, 0, 0, 0, 2, 0, 0, 0, 3, 0, 0, 0} +
-                             ByteVec{5, 0, 0, 0, 'f', 'a', 'c', 'e', 's'};
-    EXPECT_EQ(bytesOf(ar), expected);
-
-    QuickArchive in(expected.data(), expected.size());
+    const ByteVector expected = listHeader(1, 3, 4, 12).i32(1).i32(2).i32(3).text("faces").bytes;
+    EXPECT_EQ(recordOf(faces), expected);
     DefSerialIntListParam back("other");
-    ASSERT_TRUE(back.readFromArchive(in));
+    ASSERT_TRUE(readInto(back, expected));
     EXPECT_EQ(back.values(), faces.values());
     EXPECT_STREQ(back.getName(), "faces");
 }
@@ -67,34 +40,29 @@ TEST(ListParams, IntegerListRecordImage) {
 TEST(ListParams, VectorListRoundTrip) {
     DefSerialVectorListParam tverts("tverts"), back("x");
     tverts.values() = {{0.5f, 0.25f, 0}, {1, 0, -1}, {1e-6f, 3e7f, 2}};
-    QuickArchive ar;
-    ASSERT_TRUE(tverts.writeToArchive(ar));
-    const ByteVec bytes = bytesOf(ar);
-    EXPECT_EQ(ByteVec(bytes.begin(), bytes.begin() + 16), listHeader(1, 3, 12, 36));
-    QuickArchive in(bytes.data(), bytes.size());
+    const ByteVector bytes = recordOf(tverts);
+    EXPECT_EQ(ByteVector(bytes.begin(), bytes.begin() + 16), listHeader(1, 3, 12, 36).bytes);
     back.values() = {{9, 9, 9}};
-    ASSERT_TRUE(back.readFromArchive(in));
+    ASSERT_TRUE(readInto(back, bytes));
     EXPECT_EQ(back.values(), tverts.values());
     EXPECT_STREQ(back.getName(), "tverts");
 }
 
 TEST(ListParams, DamagedListRecordsAreRejected) {
-    const ByteVec three = le(1) + le(2) + le(3);
-    const ByteVec name = le(std::uint32_t{1}) + ByteVec{'f'};
     struct Case {
         const char* what;
         bool vectors;
-        ByteVec bytes;
+        ByteVector bytes;
     };
     const Case cases[] = {
-        {"version (0, 2)", false, listHeader(2, 0, 4, 0) + name},
-        {"vectors of 4 bytes", true, listHeader(1, 3, 4, 12) + three + name},
-        {"integers of 12 bytes", false, listHeader(1, 1, 12, 12) + three + name},
-        {"block shorter than the count", false, listHeader(1, 3, 4, 8) + le(1) + le(2) + name},
-        {"block longer than the count", false, listHeader(1, 2, 4, 12) + three + name},
-        {"count beyond the data", false, listHeader(1, 0x40000000, 4, 0)},
-        {"count times size beyond 32 bits", true, listHeader(1, 0x20000000, 12, 0)},
-        {"name beyond the data", false, listHeader(1, 0, 4, 0) + le(std::uint32_t{99999})},
+        {"version (0, 2)", false, listHeader(2, 0, 4, 0).text("f").bytes},
+        {"vectors of 4 bytes", true, listHeader(1, 3, 4, 12).i32(1).i32(2).i32(3).text("f").bytes},
+        {"integers of 12 bytes", false, listHeader(1, 1, 12, 12).i32(1).i32(2).i32(3).text("f").bytes},
+        {"block shorter than the count", false, listHeader(1, 3, 4, 8).i32(1).i32(2).text("f").bytes},
+        {"block longer than the count", false, listHeader(1, 2, 4, 12).i32(1).i32(2).i32(3).text("f").bytes},
+        {"count beyond the data", false, listHeader(1, 0x40000000, 4, 0).bytes},
+        {"count times size beyond 32 bits", true, listHeader(1, 0x20000000, 12, 0).bytes},
+        {"name beyond the data", false, listHeader(1, 0, 4, 0).u32(99999).bytes},
     };
     for (const Case& c : cases) {
         SCOPED_TRACE(c.what);
@@ -209,20 +177,15 @@ void addTwoChannels(DefGeomMapChannel& param) {
 TEST(GeomMapChannel, RecordWithoutTextureVerticesAndClone) {
     GeomMapChannel channel(2);
     channel.setFaces(std::vector<std::int32_t>{0, 1, 2, 2, 3, 0});
-    QuickArchive faceRecord;
-    channel.faces()->writeToArchive(faceRecord);
-    const ByteVec record = le(VersionWord::make(0, 1)) + le(2) + ByteVec{1} + bytesOf(faceRecord) + ByteVec{0};
-
-    QuickArchive in(record.data(), record.size());
+    const ByteVector record =
+        Image{}.version(0, 1).i32(2).flag(true).append(recordOf(*channel.faces())).flag(false).bytes;
     GeomMapChannel back(9);
-    ASSERT_TRUE(back.readFromArchive(in));
+    ASSERT_TRUE(readInto(back, record));
     EXPECT_EQ(back.channel(), 2);
     ASSERT_NE(back.faces(), nullptr);
     EXPECT_EQ(back.faces()->values(), channel.faces()->values());
     EXPECT_EQ(back.tverts(), nullptr);
-    QuickArchive ar;
-    ASSERT_TRUE(back.writeToArchive(ar));
-    EXPECT_EQ(bytesOf(ar), record);
+    EXPECT_EQ(recordOf(back), record);
 
     // A clone has lists of its own, present even where the original has none.
     const auto copy = back.clone();
@@ -241,33 +204,25 @@ TEST(GeomMapChannel, ChannelListRoundTripAndDamage) {
     addTwoChannels(param);
     EXPECT_FALSE(param.addChannel(GeomMapChannelPtr()));
     EXPECT_FALSE(param.channelAt(2));
-    QuickArchive ar;
-    ASSERT_TRUE(param.writeToArchive(ar));
-    const ByteVec good = bytesOf(ar);
-
-    QuickArchive in(good.data(), good.size());
+    const ByteVector good = recordOf(param);
     back.addChannel(channelOf(4, {}, {})); // replaced by the read
-    ASSERT_TRUE(back.readFromArchive(in));
+    ASSERT_TRUE(readInto(back, good));
     EXPECT_EQ(back.name(), "map_channels");
     ASSERT_EQ(back.channelCount(), 2);
     EXPECT_EQ(back.channelAt(1)->channel(), 7);
     EXPECT_EQ(back.channelAt(1)->faces()->values(), param.channelAt(1)->faces()->values());
-    QuickArchive again;
-    back.writeToArchive(again);
-    EXPECT_EQ(bytesOf(again), good);
+    EXPECT_EQ(recordOf(back), good);
 
     // A damaged second channel fails the read; the first is kept.
-    QuickArchive first;
-    param.channelAt(0)->writeToArchive(first);
-    ByteVec bytes = good;
-    bytes[4 + 4 + 12 + 4 + bytesOf(first).size() + 2] = 9; // its version (0, 9)
+    ByteVector bytes = good;
+    bytes[4 + 4 + 12 + 4 + recordOf(*param.channelAt(0)).size() + 2] = 9; // its version (0, 9)
     QuickArchive damaged(bytes.data(), bytes.size());
     EXPECT_FALSE(back.readFromArchive(damaged));
     EXPECT_EQ(back.channelCount(), 1);
     EXPECT_NE(damaged.failure()->recordPath.find("map channel 1"), std::string::npos);
 
     // A channel count beyond the data fails before anything is made.
-    const ByteVec huge = le(VersionWord::make(0, 1)) + le(std::uint32_t{0}) + le(std::uint32_t{0xFFFFFFFF});
+    const ByteVector huge = Image{}.version(0, 1).u32(0).u32(0xFFFFFFFF).bytes;
     QuickArchive hugeIn(huge.data(), huge.size());
     EXPECT_FALSE(back.readFromArchive(hugeIn));
     EXPECT_EQ(back.channelCount(), 0);

@@ -468,12 +468,5 @@ TEST_F(MaterialRecordsTest, DeepTreesAreBounded) {
     QuickArchive ar;
     EXPECT_FALSE(chain->writeToArchive(ar));
     EXPECT_TRUE(findMaterialsOfKind(chain, BaseMaterial::kLayeredBRDF).empty());
-    chain.reset();
-
-    // A stored tree deeper than the limit fails with a reason.
-    Image deep;
-    for (int i = 0; i < 300; ++i) deep.i32(BaseMaterial::kBump).version(0, 3).f32({1}).flag(false);
-    std::string why;
-    EXPECT_FALSE(readStored(deep.bytes, &why));
-    EXPECT_NE(why.find("nested deeper than 256"), std::string::npos) << why;
+    chain.reset(); // (a stored tree nested too deep: HostileInputTest)
 }

@@ -3,17 +3,14 @@
 // file. Records are assembled here from the format's row list (row, first version
 // holding it), written out independently of the record table in the code, so that
 // a row out of place or with a wrong first version shows up as wrong bytes.
-#include "archive/QuickArchive.hpp"
+#include "TestSupport.hpp"
+
 #include "archive/ZelOptFile.hpp"
 #include "options/AllOptions.hpp"
 #include "textures/SkyTexture.hpp"
-#include "xml/AssetXmlWriter.hpp"
 
 #include <gtest/gtest.h>
 
-#include <bit>
-#include <cmath>
-#include <cstdlib>
 #include <cstring>
 #include <filesystem>
 #include <fstream>
@@ -26,32 +23,10 @@
 #include <unistd.h>
 
 using namespace OrvexKavorCore;
+using namespace testsupport;
 namespace fs = std::filesystem;
 
 namespace {
-
-std::vector<std::uint8_t> bytesOf(const QuickArchive& ar) {
-    std::vector<std::uint8_t> out;
-    for (const auto& chunk : ar.chunks()) out.insert(out.end(), chunk->begin(), chunk->end());
-    out.resize(ar.writePosition());
-    return out;
-}
-
-// A 32-bit pattern that is not a NaN as a float (NaNs never compare equal); as the
-// high half of a double it is no NaN either.
-std::uint32_t randomWord(std::mt19937& rng) {
-    for (;;)
-        if (const std::uint32_t w = rng(); !std::isnan(std::bit_cast<float>(w))) return w;
-}
-
-// Non-empty UTF-8 mixing one- to four-byte characters and markup characters.
-std::string randomText(std::mt19937& rng, unsigned maxPieces = 12) {
-    static const char* const pieces[] = {"a", "Z", "7", " ", "\\", "&", "<", "\xC3\xA9", "\xE2\x82\xAC",
-                                         "\xE6\x97\xA5", "\xF0\x9F\x8E\xAC"};
-    std::string s;
-    for (unsigned i = 0, n = 1 + rng() % maxPieces; i < n; ++i) s += pieces[rng() % std::size(pieces)];
-    return s;
-}
 
 // Every plain numeric row of a record table gets random bits: the row is read back
 // from random bytes of its own stored size. Rows that do not read from random

@@ -3,9 +3,10 @@
 //
 // Set DEXMOR_UPDATE_GOLDEN=1 to rewrite the golden files from the current output
 // (then review the difference before keeping it).
+#include "TestSupport.hpp"
+
 #include "options/AllOptions.hpp"
 #include "textures/SkyTexture.hpp"
-#include "xml/AssetXmlWriter.hpp"
 
 #include <gtest/gtest.h>
 
@@ -16,6 +17,7 @@
 #include <tuple>
 
 using namespace OrvexKavorCore;
+using namespace testsupport;
 
 namespace {
 
@@ -36,12 +38,6 @@ void expectGolden(const std::string& actual, const std::string& name) {
     ASSERT_TRUE(in) << path;
     const std::string expected{std::istreambuf_iterator<char>(in), {}};
     EXPECT_EQ(actual, expected) << name;
-}
-
-std::size_t occurrences(const std::string& text, const std::string& what) {
-    std::size_t n = 0;
-    for (auto at = text.find(what); at != std::string::npos; at = text.find(what, at + 1)) ++n;
-    return n;
 }
 
 // Parameter `name` of the asset at `url`, its lines without indentation, joined.
@@ -73,12 +69,9 @@ TEST(Settings, DefaultDocumentGolden) {
 TEST(Settings, EnvironmentTexturesGolden) {
     resetSharedDefaultSun();
     AllOptions options;
-    options.bg_tex = createTexture(BaseTexture::kChecker);
-    options.gi_tex = createTexture(BaseTexture::kSky);
-    options.reflect_tex = createTexture(BaseTexture::kSky);
-    options.refract_tex = createTexture(BaseTexture::kFresnel);
-    options.bg_tex_mult = 2.0f;
-    options.refract_mult = 3.0f;
+    options.bg_tex = createTexture(BaseTexture::kChecker), options.gi_tex = createTexture(BaseTexture::kSky);
+    options.reflect_tex = createTexture(BaseTexture::kSky), options.refract_tex = createTexture(BaseTexture::kFresnel);
+    options.bg_tex_mult = 2.0f, options.refract_mult = 3.0f;
     const std::string xml = documentOf(options);
     expectGolden(xml, "options_environment_textures.xml");
 

@@ -1,6 +1,6 @@
 // The sky texture: its three record versions, its sun, the shared default sun
 // (per conversion and per thread) and its XML with the document's sun map.
-#include "TextureTestSupport.hpp"
+#include "TestSupport.hpp"
 
 #include "textures/SkyTexture.hpp"
 
@@ -10,9 +10,10 @@
 #include <cctype>
 #include <string>
 #include <thread>
+#include <tuple>
 
 using namespace OrvexKavorCore;
-using namespace texturetest;
+using namespace testsupport;
 
 namespace {
 
@@ -27,25 +28,17 @@ SunLight& sunOf(const SkyTexture& sky) { return dynamic_cast<SunLight&>(*sky.sun
 
 // The plain numbers of a sky record from up_vector to identifier.
 Image& skyFields(Image& image, const std::string& identifier) {
-    return image.f32({0, 1, 0})
-        .f32({0.5f, 4, 2.5f, 1.5f, 2, 60, 160, 0.3f})
-        .i32(400)
-        .i32(900)
-        .i32(16)
-        .flag(false)
-        .flag(true)
+    return image.f32({0, 1, 0, 0.5f, 4, 2.5f, 1.5f, 2, 60, 160, 0.3f}).i32(400).i32(900).i32(16).flag(false).flag(true)
         .text(identifier);
 }
 
-void expectFieldsOfTheImage(const SkyTexture& sky) {
-    EXPECT_EQ(sky.up_vector, (Vector{0, 1, 0}));
-    EXPECT_EQ(sky.shadowBias, 0.5f);
-    EXPECT_EQ(sky.turbidity, 4.0f);
-    EXPECT_EQ(sky.ozone, 0.3f);
-    EXPECT_EQ(sky.photonSubdivs, 400);
-    EXPECT_EQ(sky.shadow_subdivs, 16);
-    EXPECT_FALSE(sky.flag1);
-    EXPECT_TRUE(sky.flag2);
+// A sky holds the values of the image above.
+void expectFieldsOfTheImage(const SkyTexture& s) {
+    EXPECT_EQ(std::tuple(s.up_vector, s.shadowBias, s.turbidity, s.water_vapour, s.intensity_multiplier,
+                         s.size_multiplier, s.photon_radius, s.photon_emit_distance, s.ozone),
+              std::tuple(Vector{0, 1, 0}, 0.5f, 4.0f, 2.5f, 1.5f, 2.0f, 60.0f, 160.0f, 0.3f));
+    EXPECT_EQ(std::tuple(s.photonSubdivs, s.causticSubdivs, s.shadow_subdivs, s.flag1, s.flag2),
+              std::tuple(400, 900, 16, false, true));
 }
 
 } // namespace
@@ -81,52 +74,37 @@ TEST_F(Sky, Version1HoldsOnlyTheSun) {
     EXPECT_EQ(withoutSun.sun.get(), sharedDefaultSun().get());
 }
 
-TEST_F(Sky, Version2HoldsAPlainTransformThenTheFields) {
-    const Transform placed{Matrix{{{0, 1, 0}, {-1, 0, 0}, {0, 0, 1}}}, Vector{1, 2, 3}};
-    Image v2;
-    v2.version(0, 2).flag(false).f32({0, 1, 0, -1, 0, 0, 0, 0, 1, 1, 2, 3});
-    skyFields(v2, "ABCDEF01-0000-0000-0000-000000000000");
+TEST_F(Sky, Versions2And3) {
+    // Version 3: own sun, the fields, the keyed placement, the default sun, whether
+    // the sky's sun is the default sun. Read and written back byte for byte.
+    SunLight own("Noon", "{0A0B}");
+    const ByteVector defaultSun = recordOf(*sharedDefaultSun());
+    AnimatedTransform placement;
+    placement.setValue(Transform{Matrix::identity(), Vector{1, 2, 3}}, 4.0);
+    Image v3 = Image{}.version(0, 3).flag(true).append(recordOf(own));
+    skyFields(v3, "0f0e").put(placement).append(defaultSun).flag(false);
     SkyTexture read;
+    ASSERT_TRUE(readInto(read, v3.bytes));
+    expectFieldsOfTheImage(read);
+    EXPECT_EQ(read.identifier, "0f0e");
+    EXPECT_TRUE(read.sun->isEqual(boost::make_shared<SunLight>(own)));
+    EXPECT_EQ(recordOf(read), v3.bytes);
+
+    // Version 2: a plain transform instead of the keyed one, no default sun.
+    const Transform placed{Matrix{{{0, 1, 0}, {-1, 0, 0}, {0, 0, 1}}}, Vector{1, 2, 3}};
+    Image v2 = Image{}.version(0, 2).flag(false).put(placed);
+    skyFields(v2, "ABCDEF01-0000-0000-0000-000000000000");
     ASSERT_TRUE(readInto(read, v2.bytes));
     EXPECT_EQ(read.transform.keyCount(), 1);
     EXPECT_EQ(read.transform.valueAt(0), placed);
     expectFieldsOfTheImage(read);
     EXPECT_EQ(read.identifier, "ABCDEF01-0000-0000-0000-000000000000");
-
-    // Written back as version 3, which reads to the same sky.
-    const ByteVector v3 = recordOf(read);
-    EXPECT_EQ((ByteVector(v3.begin(), v3.begin() + 4)), (ByteVector{0, 0, 3, 0}));
-    const auto again = boost::make_shared<SkyTexture>();
-    ASSERT_TRUE(readInto(*again, v3));
-    EXPECT_TRUE(again->isEqual(boost::make_shared<SkyTexture>(read)));
-}
-
-TEST_F(Sky, Version3Layout) {
-    SkyTexture sky;
-    auto own = boost::make_shared<SunLight>("Noon", "{0A0B}");
-    sky.sun = own;
-    sky.up_vector = Vector{0, 1, 0};
-    sky.shadowBias = 0.5f;
-    sky.turbidity = 4;
-    sky.water_vapour = 2.5f;
-    sky.intensity_multiplier = 1.5f;
-    sky.size_multiplier = 2;
-    sky.photon_radius = 60;
-    sky.photon_emit_distance = 160;
-    sky.ozone = 0.3f;
-    sky.photonSubdivs = 400;
-    sky.causticSubdivs = 900;
-    sky.shadow_subdivs = 16;
-    sky.flag1 = false;
-    sky.flag2 = true;
-    sky.identifier = "0f0e";
-    AnimatedTransform identity;
-
-    Image expected;
-    expected.version(0, 3).flag(true).append(recordOf(*own));
-    skyFields(expected, "0f0e");
-    expected.append(recordOf(identity)).append(recordOf(*sharedDefaultSun())).flag(false);
-    EXPECT_EQ(recordOf(sky), expected.bytes);
+    // Written back as version 3 with the default sun as its sun.
+    placement = AnimatedTransform();
+    placement.setValue(placed, 0.0);
+    v3 = Image{}.version(0, 3).flag(true).append(defaultSun);
+    skyFields(v3, "ABCDEF01-0000-0000-0000-000000000000").put(placement).append(defaultSun).flag(true);
+    EXPECT_EQ(recordOf(read), v3.bytes);
 }
 
 TEST_F(Sky, Version3OverwritesTheSharedDefaultSunAndCanPointAtIt) {
@@ -211,6 +189,20 @@ TEST_F(Sky, WritingRecognisesTheDefaultSunByIdentifierIgnoringCase) {
     EXPECT_EQ(recordOf(bare)[4], 0);
 }
 
+TEST_F(Sky, ALookalikeOfTheDefaultSunIsStoredAsTheDefaultSunInBothPlaces) {
+    // Found by fuzzing: the own sun record held the lookalike's numbers while the
+    // record pointed at the default sun, so a saved sky read back to other numbers.
+    SkyTexture sky;
+    auto lookalike = boost::make_shared<SunLight>("Copy", kDefaultSunIdentifier);
+    lookalike->turbidity = 9.0f;
+    sky.sun = lookalike;
+    const ByteVector bytes = recordOf(sky);
+    SkyTexture read;
+    ASSERT_TRUE(readInto(read, bytes));
+    EXPECT_EQ(sunOf(read).turbidity, 3.0f);
+    EXPECT_EQ(recordOf(read), bytes);
+}
+
 TEST_F(Sky, AFailedSunReadIsIgnoredButOtherFailuresAreNot) {
     // The sun record carries a version no sun knows; the sky reads on.
     SkyTexture sky;
@@ -257,36 +249,16 @@ TEST_F(Sky, CopiesGetNewIdentifiersAndComparisonIgnoresTheirCase) {
 namespace {
 
 std::string sunAsset(const std::string& url) {
-    auto f = [](const char* name, const char* value) {
-        return std::string("          <parameter type=\"float\" name=\"") + name + "\" listType=\"none\" label=\"" +
-               name + "\">\n            <value>" + value + "</value>\n          </parameter>\n";
-    };
-    auto i = [](const char* type, const char* name, const char* value) {
-        return std::string("          <parameter type=\"") + type + "\" name=\"" + name +
-               "\" listType=\"none\" label=\"" + name + "\">\n            <value>" + value +
-               "</value>\n          </parameter>\n";
-    };
-    return "  <Asset layout=\"\" renderer=\"kavor\" type=\"light\" url=\"" + url +
-           "\" >\n    <plugin>\n      <kavorplugin name=\"SunLight\" type=\"light\">\n        <parameters>\n"
-           "          <parameter type=\"vector\" name=\"up_vector\" listType=\"none\" label=\"up_vector\">\n"
-           "            <value>\n              <vector>\n                <x>0</x>\n                <y>0</y>\n"
-           "                <z>1</z>\n              </vector>\n            </value>\n          </parameter>\n" +
-           f("shadowBias", "0") + f("turbidity", "3") + f("water_vapour", "2") + f("intensity_multiplier", "1") +
-           f("size_multiplier", "1") + f("photon_radius", "50") + f("photon_emit_distance", "150") +
-           f("ozone", "0.35") + i("integer", "photonSubdivs", "500") + i("integer", "causticSubdivs", "1000") +
-           i("integer", "shadow_subdivs", "8") + i("bool", "enabled", "1") + i("bool", "shadows", "1") +
-           i("bool", "invisible", "0") + "        </parameters>\n      </kavorplugin>\n    </plugin>\n  </Asset>\n";
+    return assetXml(url, "light", "SunLight",
+                    "vector up_vector 0 0 1|float shadowBias 0|float turbidity 3|float water_vapour 2|"
+                    "float intensity_multiplier 1|float size_multiplier 1|float photon_radius 50|"
+                    "float photon_emit_distance 150|float ozone 0.35|integer photonSubdivs 500|"
+                    "integer causticSubdivs 1000|integer shadow_subdivs 8|bool enabled 1|bool shadows 1|"
+                    "bool invisible 0");
 }
 
-std::string skyAsset(const std::string& url, const std::string& sunParameter) {
-    return "  <Asset layout=\"\" renderer=\"kavor\" type=\"texture\" url=\"" + url +
-           "\" >\n    <plugin>\n      <kavorplugin name=\"TexSky\" type=\"texture\">\n        <parameters>\n" +
-           sunParameter + "        </parameters>\n      </kavorplugin>\n    </plugin>\n  </Asset>\n";
-}
-
-std::string sunReference(const std::string& url) {
-    return "          <parameter type=\"plugin\" name=\"sun\" listType=\"none\" label=\"sun\">\n            <value>" +
-           url + "</value>\n          </parameter>\n";
+std::string skyAsset(const std::string& url, const std::string& sunUrl) {
+    return assetXml(url, "texture", "TexSky", "plugin sun " + sunUrl);
 }
 
 } // namespace
@@ -294,14 +266,11 @@ std::string sunReference(const std::string& url) {
 TEST_F(SkyXml, SkyWithItsSun) {
     SkyTexture sky;
     EXPECT_EQ(xmlOf(sky, "/Sky/environment"),
-              sunAsset("/SunLight") + skyAsset("/Sky/environment", sunReference("/SunLight")));
+              sunAsset("/SunLight") + skyAsset("/Sky/environment", "/SunLight"));
 
     SkyTexture bare;
     bare.sun.reset();
-    EXPECT_EQ(xmlOf(bare, "/Sky/environment"),
-              skyAsset("/Sky/environment",
-                       "          <parameter type=\"plugin\" name=\"sun\" listType=\"none\" label=\"sun\">\n"
-                       "          </parameter>\n"));
+    EXPECT_EQ(xmlOf(bare, "/Sky/environment"), skyAsset("/Sky/environment", ""));
 }
 
 TEST_F(SkyXml, OneSunAssetPerIdentifierInADocument) {
@@ -317,7 +286,6 @@ TEST_F(SkyXml, OneSunAssetPerIdentifierInADocument) {
     first.writeXml(writer, "/a/sky");
     second.writeXml(writer, "/b/sky");
     third.writeXml(writer, "/c/sky");
-    EXPECT_EQ(out, sunAsset("/SunLight") + skyAsset("/a/sky", sunReference("/SunLight")) +
-                       skyAsset("/b/sky", sunReference("/SunLight")) + sunAsset("/SunLight1") +
-                       skyAsset("/c/sky", sunReference("/SunLight1")));
+    EXPECT_EQ(out, sunAsset("/SunLight") + skyAsset("/a/sky", "/SunLight") + skyAsset("/b/sky", "/SunLight") +
+                       sunAsset("/SunLight1") + skyAsset("/c/sky", "/SunLight1"));
 }

@@ -1,13 +1,12 @@
 // Transform components: their record, the matrices built from them, comparison.
-#include "archive/QuickArchive.hpp"
+#include "TestSupport.hpp"
+
 #include "params/TransformComponents.hpp"
 
 #include <gtest/gtest.h>
 
-#include <cstring>
-#include <vector>
-
 using namespace OrvexKavorCore;
+using namespace testsupport;
 
 namespace KavorUtils {
 void PrintTo(const Matrix& m, std::ostream* os) {
@@ -16,13 +15,6 @@ void PrintTo(const Matrix& m, std::ostream* os) {
 } // namespace KavorUtils
 
 namespace {
-
-std::vector<std::uint8_t> bytesOf(const QuickArchive& ar) {
-    QuickArchive copy = ar;
-    std::vector<std::uint8_t> out(copy.writePosition());
-    copy.getRaw(out.data(), out.size());
-    return out;
-}
 
 template <class Set>
 Matrix built(Set set) {
@@ -47,34 +39,18 @@ TEST(TransformComponents, RecordLayoutRoundTripAndVersion) {
     c.z_offset = 7;
     c.x_mirror = 1;
     c.z_mirror = -3;
-    QuickArchive ar;
-    ASSERT_TRUE(c.writeToArchive(ar));
-    const auto bytes = bytesOf(ar);
-    ASSERT_EQ(bytes.size(), 4u + 9 * 4 + 3 * 4);
-    EXPECT_EQ((std::vector<std::uint8_t>(bytes.begin(), bytes.begin() + 4)),
-              (std::vector<std::uint8_t>{0x00, 0x00, 0x01, 0x00}));
-    float floats[9];
-    std::int32_t flags[3];
-    std::memcpy(floats, bytes.data() + 4, sizeof floats);
-    std::memcpy(flags, bytes.data() + 40, sizeof flags);
-    EXPECT_EQ(floats[2], 30.5f);
-    EXPECT_EQ(floats[3], 2.0f);
-    EXPECT_EQ(floats[4], 1.0f);
-    EXPECT_EQ(floats[8], 7.0f);
-    EXPECT_EQ(flags[0], 1);
-    EXPECT_EQ(flags[2], -3);
-
-    QuickArchive in(bytes.data(), bytes.size());
+    const ByteVector bytes = recordOf(c);
+    EXPECT_EQ(bytes, Image{}.version(0, 1).f32({0, 0, 30.5f, 2, 1, 1, 0, 0, 7}).i32(1).i32(0).i32(-3).bytes);
     TransformComponents back;
-    ASSERT_TRUE(back.readFromArchive(in));
+    ASSERT_TRUE(readInto(back, bytes));
     EXPECT_EQ(back, c);
 
     // Another version fails and leaves the defaults.
     auto wrong = bytes;
     wrong[2] = 2;
-    QuickArchive in2(wrong.data(), wrong.size());
-    EXPECT_FALSE(back.readFromArchive(in2));
-    EXPECT_TRUE(in2.failed());
+    QuickArchive ar;
+    EXPECT_FALSE(readInto(back, wrong, &ar));
+    EXPECT_TRUE(ar.failed());
     EXPECT_EQ(back, TransformComponents{});
 }
 

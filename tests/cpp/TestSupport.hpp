@@ -1,0 +1,225 @@
+#pragma once
+// Helpers shared by the record tests: byte images assembled by hand, the record an
+// object writes, reading records back, a check that every stored byte takes part in
+// comparison, and the exact text of XML assets written from a short description.
+#include "archive/QuickArchive.hpp"
+#include "params/AnimatedValues.hpp"
+#include "xml/AssetXmlWriter.hpp"
+
+#include <gtest/gtest.h>
+
+#include <bit>
+#include <cmath>
+#include <cstdint>
+#include <initializer_list>
+#include <random>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace testsupport {
+
+using ByteVector = std::vector<std::uint8_t>;
+using OrvexKavorCore::QuickArchive;
+
+// Little-endian byte images assembled by hand, independently of the archive's writers.
+struct Image {
+    ByteVector bytes;
+    Image& u8(std::uint8_t v) {
+        bytes.push_back(v);
+        return *this;
+    }
+    Image& flag(bool v) { return u8(v ? 1 : 0); }
+    Image& u32(std::uint32_t v) {
+        for (int i = 0; i < 4; ++i) bytes.push_back(static_cast<std::uint8_t>(v >> (8 * i)));
+        return *this;
+    }
+    Image& i32(std::int32_t v) { return u32(static_cast<std::uint32_t>(v)); }
+    Image& f64(double v) {
+        const auto bits = std::bit_cast<std::uint64_t>(v);
+        return u32(static_cast<std::uint32_t>(bits)).u32(static_cast<std::uint32_t>(bits >> 32));
+    }
+    Image& version(std::uint16_t a, std::uint16_t b) { return u32(a | (std::uint32_t{b} << 16)); }
+    Image& f32(std::initializer_list<float> vs) {
+        for (float v : vs) u32(std::bit_cast<std::uint32_t>(v));
+        return *this;
+    }
+    Image& text(std::string_view s) {
+        u32(static_cast<std::uint32_t>(s.size()));
+        bytes.insert(bytes.end(), s.begin(), s.end());
+        return *this;
+    }
+    Image& append(const ByteVector& more) {
+        bytes.insert(bytes.end(), more.begin(), more.end());
+        return *this;
+    }
+    Image& identityTransform() { return f32({1, 0, 0, 0, 1, 0, 0, 0, 1, 0, 0, 0}); }
+
+    // Values by type, as records store them.
+    Image& put(float v) { return f32({v}); }
+    Image& put(std::int32_t v) { return i32(v); }
+    Image& put(std::uint32_t v) { return u32(v); }
+    Image& put(bool v) { return flag(v); }
+    Image& put(const std::string& s) { return text(s); }
+    Image& put(const OrvexKavorCore::Vector& v) { return f32({v.x, v.y, v.z}); }
+    Image& put(const OrvexKavorCore::Color& c) { return f32({c.r, c.g, c.b}); }
+    Image& put(const OrvexKavorCore::Transform& t) { return put(t.m[0]).put(t.m[1]).put(t.m[2]).put(t.offs); }
+    // A keyed transform's record: version, key count, time size, then time and value per key.
+    Image& put(const OrvexKavorCore::AnimatedTransform& a) {
+        version(0, 1).u32(static_cast<std::uint32_t>(a.keys().size())).u32(8);
+        for (const auto& key : a.keys()) f64(key.time).put(key.value);
+        return *this;
+    }
+};
+
+// Everything written to an archive, wherever its read position stands.
+inline ByteVector bytesOf(const QuickArchive& ar) {
+    ByteVector out;
+    for (const auto& chunk : ar.chunks()) out.insert(out.end(), chunk->begin(), chunk->end());
+    out.resize(ar.writePosition());
+    return out;
+}
+
+// The record an object writes; the write must succeed.
+template <class Object>
+ByteVector recordOf(Object& object) {
+    QuickArchive ar;
+    EXPECT_TRUE(object.writeToArchive(ar));
+    return bytesOf(ar);
+}
+
+// Reads a record into `object`; an accepted record must be consumed exactly.
+// `keep` receives the archive (with its failure record).
+template <class Object>
+bool readInto(Object& object, const ByteVector& bytes, QuickArchive* keep = nullptr) {
+    QuickArchive ar(bytes.data(), bytes.size());
+    const bool ok = object.readFromArchive(ar);
+    if (ok) {
+        EXPECT_EQ(ar.readPosition(), bytes.size());
+    }
+    if (keep) *keep = ar;
+    return ok;
+}
+
+// The reason recorded by a failed read, with its record path.
+inline std::string failureOf(const QuickArchive& ar) { return ar.failure() ? ar.failure()->describe() : "(none)"; }
+
+// The XML of one object written under `url`; the writer's depth returns to 0.
+template <class Object>
+std::string xmlOf(Object& object, const std::string& url) {
+    std::string out;
+    OrvexKavorCore::AssetXmlWriter writer(out);
+    object.writeXml(writer, url);
+    EXPECT_EQ(writer.depth(), 0u);
+    return out;
+}
+
+inline std::size_t occurrences(const std::string& text, const std::string& what) {
+    std::size_t n = 0;
+    for (auto at = text.find(what); at != std::string::npos; at = text.find(what, at + 1)) ++n;
+    return n;
+}
+
+// Flips the lowest bit of every byte of `bytes` (of a record of `original`) outside
+// [skipBegin, skipEnd) in turn. Where the changed record still reads completely
+// into `make()`, the result must differ from `original`: no stored value is left
+// out of the comparison. Returns the number of bytes compared so.
+template <class Ptr, class Make>
+std::size_t expectEveryStoredByteCompared(const Ptr& original, const ByteVector& bytes, Make make,
+                                          std::size_t skipBegin = 0, std::size_t skipEnd = 0) {
+    std::size_t compared = 0;
+    for (std::size_t at = 0; at < bytes.size(); ++at) {
+        if (at >= skipBegin && at < skipEnd) continue;
+        ByteVector changed = bytes;
+        changed[at] ^= 1;
+        QuickArchive ar(changed.data(), changed.size());
+        const auto read = make();
+        if (!read->readFromArchive(ar) || ar.readPosition() != changed.size()) continue; // a flag, kind or version
+        ++compared;
+        EXPECT_FALSE(read->isEqual(original)) << "byte " << at;
+        EXPECT_FALSE(original->isEqual(read)) << "byte " << at;
+    }
+    return compared;
+}
+
+// A 32-bit pattern that is not a NaN as a float (NaNs never compare equal); as the
+// high half of a double it is no NaN either.
+inline std::uint32_t randomWord(std::mt19937& rng) {
+    for (;;)
+        if (const std::uint32_t w = rng(); !std::isnan(std::bit_cast<float>(w))) return w;
+}
+
+// Non-empty UTF-8 mixing one- to four-byte characters and markup characters.
+inline std::string randomText(std::mt19937& rng, unsigned maxPieces = 12) {
+    static const char* const pieces[] = {"a", "Z", "7", " ", "\\", "&", "<", "\xC3\xA9", "\xE2\x82\xAC",
+                                         "\xE6\x97\xA5", "\xF0\x9F\x8E\xAC"};
+    std::string s;
+    for (unsigned i = 0, n = 1 + rng() % maxPieces; i < n; ++i) s += pieces[rng() % std::size(pieces)];
+    return s;
+}
+
+// --- the exact text of assets ---
+
+inline const std::string kIdentity = "1 0 0 0 1 0 0 0 1 0 0 0";       // a transform's numbers
+inline const std::string kDefaultComponents = "0 0 0 1 1 1 0 0 0 0 0 0"; // a component block's
+
+namespace detail {
+inline std::string_view cut(std::string_view& text, char at) {
+    const auto end = text.find(at);
+    const std::string_view head = text.substr(0, end);
+    text = end == std::string_view::npos ? std::string_view{} : text.substr(end + 1);
+    return head;
+}
+inline std::string line(int depth, const std::string& text) {
+    return std::string(2 * static_cast<std::size_t>(depth), ' ') + text + "\n";
+}
+inline std::string element(std::string_view name, std::string_view value) {
+    return "<" + std::string(name) + ">" + std::string(value) + "</" + std::string(name) + ">";
+}
+inline std::string vectorLines(std::string_view& numbers) {
+    std::string s = line(7, "<vector>");
+    for (const char* c : {"x", "y", "z"}) s += line(8, element(c, cut(numbers, ' ')));
+    return s + line(7, "</vector>");
+}
+} // namespace detail
+
+// One parameter from "type name value". A colour's, vector's or transform's value
+// is its numbers separated by spaces (a transform: the three columns, then the
+// offset), a component block's its twelve numbers; a plugin reference without a
+// value has no value line; any other value runs to the end of the description.
+inline std::string parameterXml(std::string_view spec) {
+    using detail::cut, detail::line;
+    const std::string type(cut(spec, ' ')), name(cut(spec, ' '));
+    const std::string start =
+        line(5, "<parameter type=\"" + type + "\" name=\"" + name + "\" listType=\"none\" label=\"" + name + "\">");
+    std::string body;
+    if (type == "color" || type == "acolor") {
+        for (const char* c : {"r", "g", "b", "a"})
+            if (*c != 'a' || type == "acolor") body += line(7, detail::element(c, cut(spec, ' ')));
+    } else if (type == "vector" || type == "transform") {
+        for (int i = type == "vector" ? 3 : 0; i < 4; ++i) body += detail::vectorLines(spec);
+    } else if (type == "componentTransform" || type == "componentMatrix") {
+        for (const char* c : {"x_rotation", "y_rotation", "z_rotation", "x_scale", "y_scale", "z_scale", "x_offset",
+                              "y_offset", "z_offset", "x_mirror", "y_mirror", "z_mirror"})
+            body += line(7, detail::element(c, cut(spec, ' ')));
+    } else {
+        const bool noValue = type == "plugin" && spec.empty();
+        return start + (noValue ? "" : line(6, detail::element("value", spec))) + line(5, "</parameter>");
+    }
+    return start + line(6, "<value>") + body + line(6, "</value>") + line(5, "</parameter>");
+}
+
+// One asset at the first level of a document; `params` lists parameter
+// descriptions (see parameterXml) separated by '|'.
+inline std::string assetXml(const std::string& url, const std::string& type, const std::string& plugin,
+                            std::string_view params, const std::string& layout = "") {
+    using detail::line;
+    std::string s = line(1, "<Asset layout=\"" + layout + "\" renderer=\"kavor\" type=\"" + type + "\" url=\"" + url +
+                                "\" >") +
+                    line(2, "<plugin>") + line(3, "<kavorplugin name=\"" + plugin + "\" type=\"" + type + "\">") +
+                    line(4, "<parameters>");
+    while (!params.empty()) s += parameterXml(detail::cut(params, '|'));
+    return s + line(4, "</parameters>") + line(3, "</kavorplugin>") + line(2, "</plugin>") + line(1, "</Asset>");
+}
+
+} // namespace testsupport
