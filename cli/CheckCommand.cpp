@@ -21,7 +21,7 @@ std::string lineOf(std::string_view name, const core::Diagnosis& diagnosis) {
     std::string line(name);
     if (diagnosis.readsAsBinary) return line + ": " + diagnosis.description + "\n";
     line += ": not readable as binary: ";
-    line += diagnosis.failure ? diagnosis.failure->describe() : std::string("no reason was recorded");
+    line += diagnosis.reason();
     if (diagnosis.fallbackLength > 0)
         line += "; the conversion returns the file's text (" + std::to_string(diagnosis.fallbackLength) + " bytes)";
     else

@@ -26,11 +26,11 @@ const std::string_view helpText =
     "      adding nothing between them. A file that is not in the binary format\n"
     "      is taken to be XML text already and is written as it stands.\n"
     "\n"
-    "      -o DIR, --output DIR\n"
+    "      -o DIR, -oDIR, --output DIR, --output=DIR\n"
     "          Writes each document to DIR/<file name>.xml instead (scene.zelmat\n"
     "          gives DIR/scene.zelmat.xml). DIR is created if it is missing. A\n"
     "          document appears there only once it is complete.\n"
-    "      -j N, --jobs N\n"
+    "      -j N, -jN, --jobs N, --jobs=N\n"
     "          With -o, converts N files at a time (default: one per core). The\n"
     "          documents are the same whatever N is. When standard error is a\n"
     "          terminal, a progress line shows the files done, the rate and the\n"
@@ -62,7 +62,10 @@ const std::string_view helpText =
     "         extension, missing or not a regular file). The other FILEs are\n"
     "         still converted.\n"
     "  check  0 when every FILE reads as binary; 1 when one does not; 2 for wrong\n"
-    "         usage or a FILE with an unknown extension.\n";
+    "         usage or a FILE with an unknown extension.\n"
+    "\n"
+    "More in 'man dexmor'. From Python: Dexmor.getZelmatXml, Dexmor.getZeloptXml\n"
+    "and Dexmor.diagnose.\n";
 
 namespace {
 

@@ -184,7 +184,7 @@ PyObject* diagnoseFile(PyObject* args, const Call& call) {
     core::Diagnosis diagnosis;
     withoutInterpreterLock([&] { diagnosis = core::diagnose(file->kind, std::filesystem::path(std::move(file->path))); });
     if (diagnosis.readsAsBinary) Py_RETURN_NONE;
-    return textObject(diagnosis.failure ? diagnosis.failure->describe() : std::string("no reason was recorded"));
+    return textObject(diagnosis.reason());
 }
 
 template <PyObject* (*Body)(PyObject*, const Call&)>

@@ -53,6 +53,11 @@ std::string convertBytesToXml(FileKind kind, std::string_view bytes) {
     return xml;
 }
 
+std::string Diagnosis::reason() const {
+    if (!opened) return "the file cannot be opened";
+    return failure ? failure->describe() : std::string("no reason was recorded");
+}
+
 Diagnosis diagnose(FileKind kind, const std::filesystem::path& path) {
     const std::optional<std::string> bytes = readRegularFile(path);
     if (!bytes) return Diagnosis{false, false, {}, ReadFailure{"the file cannot be opened", 0, {}}, 0};

@@ -50,6 +50,10 @@ struct Diagnosis {
     // (UTF-8) of the pass-through text the conversion returns instead.
     std::optional<ReadFailure> failure;
     std::size_t fallbackLength = 0;
+
+    // Why the file does not read as binary, for a user: the failure with its record
+    // path and offset, or that the file cannot be opened.
+    std::string reason() const;
 };
 
 Diagnosis diagnose(FileKind kind, const std::filesystem::path& path);

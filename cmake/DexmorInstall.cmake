@@ -1,0 +1,82 @@
+# What `cmake --install` puts under the prefix, every destination relative to it
+# so that `cmake --install <build> --prefix <dir>` relocates the whole tree:
+#   include/dexmor/...                 the headers of core/, in their subdirectories
+#   lib/libdexmor_core.a               the library
+#   lib/cmake/Dexmor/                  find_package(Dexmor CONFIG) with the target Dexmor::core
+#   lib/pkgconfig/dexmor.pc            for pkg-config
+#   bin/dexmor, share/man/man1/dexmor.1
+#   <DEXMOR_PYTHON_INSTALL_DIR>/       the module Dexmor and its type stub Dexmor.pyi
+include(GNUInstallDirs)
+include(CMakePackageConfigHelpers)
+
+set(DEXMOR_INSTALL_CMAKEDIR "${CMAKE_INSTALL_LIBDIR}/cmake/Dexmor" CACHE STRING
+    "Where the CMake package files go, relative to the prefix")
+set(DEXMOR_INSTALL_INCLUDEDIR "${CMAKE_INSTALL_INCLUDEDIR}/dexmor")
+
+# A library built with the sanitizers needs their runtimes in every program that
+# links it, so a sanitized build hands its link flags on to its consumers.
+set(DEXMOR_CONSUMER_LINK_OPTIONS "")
+if(DEXMOR_SANITIZE OR DEXMOR_BUILD_FUZZ)
+  set(DEXMOR_CONSUMER_LINK_OPTIONS -fsanitize=address,undefined)
+endif()
+
+# ---- the library and its headers ---------------------------------------------
+set_target_properties(dexmor_core PROPERTIES EXPORT_NAME core)
+target_include_directories(dexmor_core INTERFACE $<INSTALL_INTERFACE:${DEXMOR_INSTALL_INCLUDEDIR}>)
+target_link_options(dexmor_core INTERFACE $<INSTALL_INTERFACE:${DEXMOR_CONSUMER_LINK_OPTIONS}>)
+install(TARGETS dexmor_core EXPORT DexmorTargets
+        ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT Development)
+install(DIRECTORY ${PROJECT_SOURCE_DIR}/core/ DESTINATION ${DEXMOR_INSTALL_INCLUDEDIR}
+        COMPONENT Development FILES_MATCHING PATTERN "*.hpp")
+
+# ---- CMake package -------------------------------------------------------------
+install(EXPORT DexmorTargets NAMESPACE Dexmor:: DESTINATION ${DEXMOR_INSTALL_CMAKEDIR}
+        COMPONENT Development)
+configure_package_config_file(${CMAKE_CURRENT_LIST_DIR}/DexmorConfig.cmake.in
+                              ${PROJECT_BINARY_DIR}/package/DexmorConfig.cmake
+                              INSTALL_DESTINATION ${DEXMOR_INSTALL_CMAKEDIR})
+# Before 1.0 a new minor version may change the interface.
+write_basic_package_version_file(${PROJECT_BINARY_DIR}/package/DexmorConfigVersion.cmake
+                                 COMPATIBILITY SameMinorVersion)
+install(FILES ${PROJECT_BINARY_DIR}/package/DexmorConfig.cmake
+              ${PROJECT_BINARY_DIR}/package/DexmorConfigVersion.cmake
+        DESTINATION ${DEXMOR_INSTALL_CMAKEDIR} COMPONENT Development)
+
+# ---- pkg-config ----------------------------------------------------------------
+# The prefix is found from the file's own place, so the tree can be moved.
+file(RELATIVE_PATH DEXMOR_PC_TO_PREFIX "/prefix/${CMAKE_INSTALL_LIBDIR}/pkgconfig" "/prefix")
+string(REGEX REPLACE "/$" "" DEXMOR_PC_TO_PREFIX "${DEXMOR_PC_TO_PREFIX}")
+list(JOIN DEXMOR_CONSUMER_LINK_OPTIONS " " DEXMOR_PC_LINK_OPTIONS)
+configure_file(${CMAKE_CURRENT_LIST_DIR}/dexmor.pc.in ${PROJECT_BINARY_DIR}/package/dexmor.pc @ONLY)
+install(FILES ${PROJECT_BINARY_DIR}/package/dexmor.pc
+        DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT Development)
+
+# ---- the tool and its manual page --------------------------------------------------
+install(TARGETS dexmor RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT Runtime)
+install(FILES ${PROJECT_SOURCE_DIR}/docs/dexmor.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT Runtime)
+
+# ---- the Python module --------------------------------------------------------------
+if(TARGET Dexmor)
+  # The interpreter's own directory for extension modules, relative to its prefix
+  # so that it lands under the prefix given at install time (on Debian
+  # lib/python3.X/dist-packages, which is on the path under /usr and /usr/local).
+  get_directory_property(python DIRECTORY ${PROJECT_SOURCE_DIR}/module DEFINITION Python3_EXECUTABLE)
+  execute_process(
+    COMMAND ${python} -c [=[
+import os, sys, sysconfig
+scheme = sysconfig.get_default_scheme() if hasattr(sysconfig, "get_default_scheme") else sysconfig._get_default_scheme()
+# Debian's default scheme puts an interpreter of prefix /usr at /usr/local.
+base = os.path.join(sys.prefix, "local") if scheme == "posix_local" else sys.prefix
+print(os.path.relpath(sysconfig.get_path("platlib", scheme), base), end="")
+]=]
+    OUTPUT_VARIABLE python_site RESULT_VARIABLE python_failed)
+  if(python_failed OR python_site MATCHES "^\\.\\.")
+    get_directory_property(python_site DIRECTORY ${PROJECT_SOURCE_DIR}/module DEFINITION Python3_SITEARCH)
+  endif()
+  set(DEXMOR_PYTHON_INSTALL_DIR "${python_site}" CACHE STRING
+      "Where the Python module goes: relative to the install prefix, or absolute")
+  install(TARGETS Dexmor LIBRARY DESTINATION ${DEXMOR_PYTHON_INSTALL_DIR} COMPONENT Python)
+  install(FILES ${PROJECT_SOURCE_DIR}/module/Dexmor.pyi DESTINATION ${DEXMOR_PYTHON_INSTALL_DIR} COMPONENT Python)
+  # Beside the built module too, for editors pointed at <build>/python.
+  configure_file(${PROJECT_SOURCE_DIR}/module/Dexmor.pyi ${PROJECT_BINARY_DIR}/python/Dexmor.pyi COPYONLY)
+endif()

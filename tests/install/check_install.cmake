@@ -1,0 +1,102 @@
+# Installs a build into a fresh prefix and uses it as its users would:
+#   1. cmake --install BUILD_DIR --prefix WORK_DIR/prefix;
+#   2. the installed dexmor converts SAMPLE (the reference for what follows);
+#   3. a CMake project finds the package with find_package(Dexmor) and links Dexmor::core;
+#   4. the same program is compiled with nothing but the flags pkg-config gives;
+#   5. the module imports from the installed site-packages directory.
+# Each program's document must equal the installed tool's, byte for byte.
+#
+# Variables: BUILD_DIR, WORK_DIR, SOURCE_DIR, SAMPLE, CXX, GENERATOR, MAKE_PROGRAM,
+# VERSION, LIBDIR (relative to the prefix), and optionally PKG_CONFIG, PYTHON with
+# PYTHON_DIR, SANITIZER_RUNTIME.
+cmake_minimum_required(VERSION 3.25)
+
+# Runs a command; stops the test with its output when it fails.
+function(run)
+  execute_process(COMMAND ${ARGN} RESULT_VARIABLE status OUTPUT_VARIABLE out ERROR_VARIABLE err)
+  if(NOT status EQUAL 0)
+    string(REPLACE ";" " " shown "${ARGN}")
+    message(FATAL_ERROR "failed (${status}): ${shown}\n${out}\n${err}")
+  endif()
+  set(run_output "${out}" PARENT_SCOPE)
+endfunction()
+
+# Runs a converting program and checks that it writes the reference document.
+function(expect_reference what)
+  execute_process(COMMAND ${ARGN} RESULT_VARIABLE status OUTPUT_FILE ${WORK_DIR}/${what}.xml ERROR_VARIABLE err)
+  if(NOT status EQUAL 0)
+    message(FATAL_ERROR "${what} failed (${status}):\n${err}")
+  endif()
+  execute_process(COMMAND ${CMAKE_COMMAND} -E compare_files ${WORK_DIR}/reference.xml ${WORK_DIR}/${what}.xml
+                  RESULT_VARIABLE differs)
+  if(differs)
+    message(FATAL_ERROR "${what} wrote another document than the installed dexmor (see ${WORK_DIR})")
+  endif()
+  message(STATUS "${what}: same document as the installed dexmor")
+endfunction()
+
+set(prefix ${WORK_DIR}/prefix)
+file(REMOVE_RECURSE ${WORK_DIR})
+file(MAKE_DIRECTORY ${WORK_DIR})
+
+# 1. Install.
+run(${CMAKE_COMMAND} --install ${BUILD_DIR} --prefix ${prefix})
+foreach(file include/dexmor/archive/Conversion.hpp include/dexmor/archive/ZelMatFile.hpp share/man/man1/dexmor.1)
+  if(NOT EXISTS ${prefix}/${file})
+    message(FATAL_ERROR "not installed: ${file}")
+  endif()
+endforeach()
+
+# 2. The installed tool gives the reference document.
+execute_process(COMMAND ${prefix}/bin/dexmor xml ${SAMPLE} RESULT_VARIABLE status
+                OUTPUT_FILE ${WORK_DIR}/reference.xml ERROR_VARIABLE err)
+file(READ ${WORK_DIR}/reference.xml head LIMIT 9)
+if(NOT status EQUAL 0 OR NOT head STREQUAL "<Assets>\n")
+  message(FATAL_ERROR "the installed dexmor did not convert ${SAMPLE} (${status}):\n${err}")
+endif()
+
+# 3. find_package.
+run(${CMAKE_COMMAND} -S ${SOURCE_DIR}/consumer -B ${WORK_DIR}/consumer -G ${GENERATOR}
+    -DCMAKE_MAKE_PROGRAM=${MAKE_PROGRAM} -DCMAKE_CXX_COMPILER=${CXX} -DCMAKE_BUILD_TYPE=Debug
+    -DCMAKE_PREFIX_PATH=${prefix} -DCMAKE_FIND_USE_PACKAGE_REGISTRY=OFF)
+string(FIND "${run_output}" "Dexmor package: ${prefix}/" found)
+if(found EQUAL -1)
+  message(FATAL_ERROR "find_package(Dexmor) took a package from outside ${prefix}:\n${run_output}")
+endif()
+run(${CMAKE_COMMAND} --build ${WORK_DIR}/consumer)
+expect_reference(find_package-consumer ${WORK_DIR}/consumer/consumer ${SAMPLE})
+
+# 4. pkg-config.
+if(PKG_CONFIG)
+  set(ENV{PKG_CONFIG_PATH} ${prefix}/${LIBDIR}/pkgconfig)
+  run(${PKG_CONFIG} --modversion dexmor)
+  string(STRIP "${run_output}" version)
+  if(NOT version STREQUAL VERSION)
+    message(FATAL_ERROR "pkg-config gives version '${version}', not ${VERSION}")
+  endif()
+  run(${PKG_CONFIG} --cflags --libs dexmor)
+  separate_arguments(flags UNIX_COMMAND "${run_output}")
+  run(${CXX} -std=c++20 ${SOURCE_DIR}/consumer/main.cpp ${flags} -o ${WORK_DIR}/pkg-config-consumer)
+  expect_reference(pkg-config-consumer ${WORK_DIR}/pkg-config-consumer ${SAMPLE})
+else()
+  message(STATUS "pkg-config not found: the pkg-config consumer is not built")
+endif()
+
+# 5. The module from site-packages, with its stub beside it.
+if(PYTHON AND IS_ABSOLUTE "${PYTHON_DIR}")
+  message(STATUS "the module is installed outside the prefix (${PYTHON_DIR}): not checked")
+elseif(PYTHON)
+  set(site ${prefix}/${PYTHON_DIR})
+  set(env PYTHONPATH=${site} PYTHONDONTWRITEBYTECODE=1)
+  if(SANITIZER_RUNTIME)
+    # The interpreter is not instrumented: the runtime must be loaded first.
+    list(APPEND env LD_PRELOAD=${SANITIZER_RUNTIME} ASAN_OPTIONS=detect_leaks=0)
+  endif()
+  expect_reference(installed-module ${CMAKE_COMMAND} -E env ${env} ${PYTHON} -s -c [=[
+import os, sys, Dexmor
+site = os.path.realpath(sys.argv[1])
+assert os.path.dirname(os.path.realpath(Dexmor.__file__)) == site, Dexmor.__file__
+assert os.path.isfile(os.path.join(site, "Dexmor.pyi")), "no Dexmor.pyi beside the module"
+sys.stdout.buffer.write(Dexmor.getZelmatXml(sys.argv[2]).encode("utf-8"))
+]=] ${site} ${SAMPLE})
+endif()

@@ -1,0 +1,98 @@
+"""examples/convert_on_dask.py on a local cluster of two worker processes: every
+output equals what the module returns for the file, and the summary lists
+exactly the files that passed through as text."""
+import os
+import pathlib
+import shutil
+import subprocess
+import sys
+
+import pytest
+
+pytest.importorskip("dask")
+pytest.importorskip("distributed")
+
+import Dexmor
+
+SOURCE = pathlib.Path(os.environ.get("DEXMOR_SOURCE_DIR", pathlib.Path(__file__).parents[2]))
+SCRIPT = SOURCE / "examples" / "convert_on_dask.py"
+
+
+def convert(path):
+    call = Dexmor.getZelmatXml if path.suffix.lower() == ".zelmat" else Dexmor.getZeloptXml
+    return call(str(path))
+
+
+def variant(sample, offset, data):
+    changed = bytearray(sample)
+    changed[offset: offset + len(data)] = data
+    return bytes(changed)
+
+
+def make_inputs(folder):
+    """50 files: copies of the two samples under other names, and ten that do not
+    read as binary. Returns the names of those ten."""
+    zelmat = (SOURCE / "examples" / "sample.zelmat").read_bytes()
+    zelopt = (SOURCE / "examples" / "sample.zelopt").read_bytes()
+    for i in range(20):
+        (folder / f"library {i:02}.{'ZELMAT' if i % 5 == 0 else 'zelmat'}").write_bytes(zelmat)
+        (folder / f"scene-{i:02}.zelopt").write_bytes(zelopt)
+    fallbacks = {
+        "text.zelmat": b'<?xml version="1.0"?>\n<Assets>\n  <Asset url="/a&amp;b"/>\n</Assets>\n',
+        "utf8.zelopt": "<Assets name='Grüße 東京'/>".encode("utf-8"),
+        "cp1252.zelmat": b"<Assets name='caf\xe9 \x80 \x81'/>",
+        "empty.zelopt": b"",
+        "nul-cut.zelopt": b"<Assets/>\0hidden",
+        "generation 9.zelmat": variant(zelmat, 2, b"\x09\x00"),
+        "unknown kind.zelmat": variant(zelmat, 12, (99).to_bytes(4, "little")),
+        "truncated.zelmat": zelmat[:5000],
+        "options version.zelopt": variant(zelopt, 2, b"\xff\xff"),
+        "no materials.zelmat": variant(zelmat, 4, b"\0\0\0\0"),
+    }
+    for name, data in fallbacks.items():
+        (folder / name).write_bytes(data)
+    (folder / "notes.txt").write_text("not an input")
+    (folder / "folder.zelmat").mkdir()  # neither is converted
+    return set(fallbacks)
+
+
+def test_converts_a_folder_on_two_worker_processes(tmp_path):
+    inputs, out, elsewhere = tmp_path / "in", tmp_path / "out", tmp_path / "elsewhere"
+    inputs.mkdir()
+    elsewhere.mkdir()
+    fallbacks = make_inputs(inputs)
+    files = sorted(p for p in inputs.iterdir() if p.is_file() and p.suffix.lower() in (".zelmat", ".zelopt"))
+    assert len(files) == 50
+    # Beside the folder, paths that are reported and not converted: a second file of
+    # an input's name (its document would replace the first one's), a name with
+    # neither extension, a missing file.
+    shutil.copy(inputs / "empty.zelopt", elsewhere / "empty.zelopt")
+    (elsewhere / "notes.txt").write_text("x")
+    refused = [elsewhere / "empty.zelopt", elsewhere / "notes.txt", elsewhere / "missing.zelmat"]
+
+    run = subprocess.run([sys.executable, str(SCRIPT), "--workers", "2", "--batch-size", "4", "-o", str(out),
+                          str(inputs), *map(str, refused)], capture_output=True, text=True, timeout=600)
+    assert run.returncode == 1, run.stderr
+    assert run.stdout.startswith("50 of 50 files converted on 2 workers"), run.stdout
+    # Dask may add lines of its own (a slow event loop on a loaded machine).
+    problems = sorted(line for line in run.stderr.splitlines() if line.startswith("convert_on_dask: "))
+    assert len(problems) == 3, run.stderr
+    assert "empty.zelopt: not written" in problems[0] and "already holds the document of" in problems[0]
+    assert "missing.zelmat: not converted" in problems[1] and "notes.txt: not converted" in problems[2]
+
+    written = {p.name for p in out.iterdir()}
+    assert written == {f.name + ".xml" for f in files} | {"text-fallbacks.tsv"}
+    for f in files:
+        assert (out / (f.name + ".xml")).read_bytes() == convert(f).encode("utf-8"), f.name
+
+    header, *rows = (out / "text-fallbacks.tsv").read_text(encoding="utf-8").splitlines()
+    assert header == "file\treason\toutput_bytes"
+    listed = {}
+    for row in rows:
+        path, reason, size = row.split("\t")
+        listed[pathlib.Path(path).name] = (reason, int(size))
+    assert set(listed) == fallbacks
+    for name, (reason, size) in listed.items():
+        assert size == len(convert(inputs / name).encode("utf-8"))
+        if hasattr(Dexmor, "diagnose"):
+            assert reason == " ".join(Dexmor.diagnose(str(inputs / name)).split())
