@@ -187,24 +187,24 @@ inline std::string vectorLines(std::string_view& numbers) {
 // is its numbers separated by spaces (a transform: the three columns, then the
 // offset), a component block's its twelve numbers; a plugin reference without a
 // value has no value line; any other value runs to the end of the description.
-inline std::string parameterXml(std::string_view spec) {
+inline std::string parameterXml(std::string_view shape) {
     using detail::cut, detail::line;
-    const std::string type(cut(spec, ' ')), name(cut(spec, ' '));
+    const std::string type(cut(shape, ' ')), name(cut(shape, ' '));
     const std::string start =
         line(5, "<parameter type=\"" + type + "\" name=\"" + name + "\" listType=\"none\" label=\"" + name + "\">");
     std::string body;
     if (type == "color" || type == "acolor") {
         for (const char* c : {"r", "g", "b", "a"})
-            if (*c != 'a' || type == "acolor") body += line(7, detail::element(c, cut(spec, ' ')));
+            if (*c != 'a' || type == "acolor") body += line(7, detail::element(c, cut(shape, ' ')));
     } else if (type == "vector" || type == "transform") {
-        for (int i = type == "vector" ? 3 : 0; i < 4; ++i) body += detail::vectorLines(spec);
+        for (int i = type == "vector" ? 3 : 0; i < 4; ++i) body += detail::vectorLines(shape);
     } else if (type == "componentTransform" || type == "componentMatrix") {
         for (const char* c : {"x_rotation", "y_rotation", "z_rotation", "x_scale", "y_scale", "z_scale", "x_offset",
                               "y_offset", "z_offset", "x_mirror", "y_mirror", "z_mirror"})
-            body += line(7, detail::element(c, cut(spec, ' ')));
+            body += line(7, detail::element(c, cut(shape, ' ')));
     } else {
-        const bool noValue = type == "plugin" && spec.empty();
-        return start + (noValue ? "" : line(6, detail::element("value", spec))) + line(5, "</parameter>");
+        const bool noValue = type == "plugin" && shape.empty();
+        return start + (noValue ? "" : line(6, detail::element("value", shape))) + line(5, "</parameter>");
     }
     return start + line(6, "<value>") + body + line(6, "</value>") + line(5, "</parameter>");
 }
