@@ -47,7 +47,7 @@ std::string convertBytesToXml(FileKind kind, std::string_view bytes) {
     std::string xml;
     const TextSink sink = [&xml](std::string_view piece) { xml.append(piece); };
     if (kind == FileKind::MaterialLibrary)
-        ZelMatFile().bytesToXml(boost::make_shared<const std::string>(bytes), sink);
+        ZelMatFile().bytesToXml(SharedBytes::copyOf(bytes), sink);
     else
         ZelOptFile().bytesToXml(bytes, sink);
     return xml;
@@ -59,9 +59,9 @@ std::string Diagnosis::reason() const {
 }
 
 Diagnosis diagnose(FileKind kind, const std::filesystem::path& path) {
-    const std::optional<std::string> bytes = readRegularFile(path);
+    const std::optional<SharedBytes> bytes = readRegularFile(path);
     if (!bytes) return Diagnosis{false, false, {}, ReadFailure{"the file cannot be opened", 0, {}}, 0};
-    return diagnoseBytes(kind, *bytes);
+    return diagnoseBytes(kind, bytes->view());
 }
 
 Diagnosis diagnoseBytes(FileKind kind, std::string_view bytes) {
@@ -71,7 +71,7 @@ Diagnosis diagnoseBytes(FileKind kind, std::string_view bytes) {
     result.opened = true;
     if (kind == FileKind::MaterialLibrary) {
         ZelMatFile file;
-        if (const auto framing = file.readThrough(boost::make_shared<const std::string>(bytes))) {
+        if (const auto framing = file.readThrough(SharedBytes::copyOf(bytes))) {
             result.readsAsBinary = true;
             result.description = "material library, generation " + std::to_string(framing->generation) + ", " +
                                  std::to_string(framing->count) +

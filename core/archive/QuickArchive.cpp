@@ -51,10 +51,9 @@ QuickArchive::QuickArchive(const void* data, std::size_t length) {
     writePos_ = length;
 }
 
-QuickArchive QuickArchive::viewOf(boost::shared_ptr<const std::string> owner, std::size_t offset,
-                                  std::size_t length) {
+QuickArchive QuickArchive::viewOf(const SharedBytes& bytes, std::size_t offset, std::size_t length) {
     QuickArchive ar(0);
-    if (!owner || offset > owner->size() || length > owner->size() - offset) {
+    if (offset > bytes.size() || length > bytes.size() - offset) {
         ar.fail("the archive lies outside the data");
         return ar;
     }
@@ -66,9 +65,9 @@ QuickArchive QuickArchive::viewOf(boost::shared_ptr<const std::string> owner, st
     ar.chunks_.reserve(whole + 1);
     // The bytes stay where they are. A Chunk is an array of bytes with alignment 1,
     // so any position in the buffer can be seen as one.
-    auto* base = reinterpret_cast<std::uint8_t*>(const_cast<char*>(owner->data() + offset));
+    auto* base = reinterpret_cast<std::uint8_t*>(const_cast<char*>(bytes.data() + offset));
     for (std::size_t k = 0; k < whole; ++k)
-        ar.chunks_.emplace_back(owner, reinterpret_cast<Chunk*>(base + k * kChunkSize));
+        ar.chunks_.emplace_back(bytes.owner(), reinterpret_cast<Chunk*>(base + k * kChunkSize));
     if (const std::size_t tail = length % kChunkSize) {
         auto chunk = newChunk();
         std::memcpy(chunk->data(), base + whole * kChunkSize, tail);

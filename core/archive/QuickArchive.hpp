@@ -13,6 +13,7 @@
 // by Scope. The first failure is kept with its offset and record path so that the
 // user can be told why a file did not read.
 #include "platform/KavorTypes.hpp"
+#include "platform/SharedBytes.hpp"
 
 #include <boost/array.hpp>
 #include <boost/shared_ptr.hpp>
@@ -68,10 +69,10 @@ public:
     // the end. Buffers of 4 GiB or more give an empty archive marked as failed.
     QuickArchive(const void* data, std::size_t length);
     // An archive over `length` bytes of `owner` from `offset`, without copying them:
-    // every whole chunk is a view into the buffer, which the archive keeps alive; a
+    // every whole chunk is a view into the bytes, whose owner the archive keeps alive; a
     // trailing partial chunk is copied and zero-padded. For reading only: a write
     // would change the owner's bytes. Out-of-range spans give a failed, empty archive.
-    static QuickArchive viewOf(boost::shared_ptr<const std::string> owner, std::size_t offset, std::size_t length);
+    static QuickArchive viewOf(const SharedBytes& bytes, std::size_t offset, std::size_t length);
     virtual ~QuickArchive();
 
     QuickArchive(const QuickArchive&) = default; // shares the chunks

@@ -7,8 +7,6 @@
 #include "textures/SkyTexture.hpp"
 #include "xml/AssetXmlWriter.hpp"
 
-#include <boost/make_shared.hpp>
-
 #include <algorithm>
 #include <cstring>
 #include <ios>
@@ -33,11 +31,11 @@ std::uint32_t readLittleEndian32(const char* p) {
 } // namespace
 
 std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(std::string_view bytes, ReadFailure* failure) {
-    return readFraming(boost::make_shared<const std::string>(bytes), failure);
+    return readFraming(SharedBytes::copyOf(bytes), failure);
 }
 
 std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(const SharedBytes& shared, ReadFailure* failure) {
-    const std::string_view bytes = *shared;
+    const std::string_view bytes = shared.view();
     const auto reject = [&](std::string reason, std::uint64_t offset,
                             std::string recordPath = "header") -> std::optional<Framing> {
         if (failure) *failure = ReadFailure{std::move(reason), offset, std::move(recordPath)};
@@ -57,10 +55,11 @@ std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(const SharedBytes& sh
     switch (framing.generation) {
     case 1: {
         // The first generation's writer lost every carriage-return byte; so does its reader.
-        auto kept = boost::make_shared<std::string>();
-        kept->reserve(body.size());
-        std::copy_if(body.begin(), body.end(), std::back_inserter(*kept), [](char c) { return c != '\x0D'; });
-        framing.archive = QuickArchive::viewOf(kept, 0, kept->size());
+        std::string kept;
+        kept.reserve(body.size());
+        std::copy_if(body.begin(), body.end(), std::back_inserter(kept), [](char c) { return c != '\x0D'; });
+        const SharedBytes keptBytes = SharedBytes::adopt(std::move(kept));
+        framing.archive = QuickArchive::viewOf(keptBytes, 0, keptBytes.size());
         break;
     }
     case 2:
@@ -89,16 +88,17 @@ std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(const SharedBytes& sh
 }
 
 std::uint64_t ZelMatFile::Framing::fileOffsetOf(std::uint64_t archivePosition) const {
-    if (generation != 1 || !file) return archiveStart + archivePosition;
+    if (generation != 1) return archiveStart + archivePosition;
     // The archive holds the body's bytes without their carriage returns: find the
     // kept byte at that position.
     std::uint64_t kept = 0;
-    for (std::uint64_t offset = archiveStart; offset < file->size(); ++offset) {
-        if ((*file)[offset] == '\x0D') continue;
+    const std::string_view bytes = file.view();
+    for (std::uint64_t offset = archiveStart; offset < bytes.size(); ++offset) {
+        if (bytes[offset] == '\x0D') continue;
         if (kept == archivePosition) return offset;
         ++kept;
     }
-    return file->size() + (archivePosition - kept); // positions past the end count on from it
+    return bytes.size() + (archivePosition - kept); // positions past the end count on from it
 }
 
 bool ZelMatFile::readMaterials(Framing& framing, const std::function<void(MaterialPtr&&)>& take) {
@@ -127,7 +127,7 @@ bool ZelMatFile::readMaterials(Framing& framing, const std::function<void(Materi
 }
 
 bool ZelMatFile::readFromBytes(std::string_view bytes) {
-    return readFromBytes(boost::make_shared<const std::string>(bytes));
+    return readFromBytes(SharedBytes::copyOf(bytes));
 }
 
 bool ZelMatFile::readFromBytes(const SharedBytes& bytes) {
@@ -203,7 +203,7 @@ void ZelMatFile::names(std::vector<std::string>& out) const {
 }
 
 bool ZelMatFile::load(const std::filesystem::path& path) {
-    const std::optional<std::string> bytes = readRegularFile(path);
+    const std::optional<SharedBytes> bytes = readRegularFile(path);
     if (!bytes) {
         lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
         return false;
@@ -218,7 +218,7 @@ bool ZelMatFile::save(const std::filesystem::path& path) {
 }
 
 std::ios_base::openmode ZelMatFile::probeOpenMode(const std::filesystem::path& path) {
-    const std::optional<std::string> bytes = readRegularFile(path);
+    const std::optional<SharedBytes> bytes = readRegularFile(path);
     if (!bytes) return std::ios_base::in;
     if (bytes->size() >= 4 && VersionWord{readLittleEndian32(bytes->data())}.is(0, 1)) return std::ios_base::in;
     return std::ios_base::in | std::ios_base::binary;
@@ -267,12 +267,12 @@ std::string ZelMatFile::toXml(const std::filesystem::path& path) {
 }
 
 void ZelMatFile::toXml(const std::filesystem::path& path, const TextSink& sink) {
-    std::optional<std::string> bytes = readRegularFile(path);
+    const std::optional<SharedBytes> bytes = readRegularFile(path);
     if (!bytes) {
         lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
         return;
     }
-    bytesToXml(boost::make_shared<const std::string>(std::move(*bytes)), sink);
+    bytesToXml(*bytes, sink);
 }
 
 void ZelMatFile::bytesToXml(const SharedBytes& bytes, const TextSink& sink) {
@@ -281,7 +281,7 @@ void ZelMatFile::bytesToXml(const SharedBytes& bytes, const TextSink& sink) {
     resetSharedDefaultSun();
     if (writeXml(bytes, sink)) return;
     // Not a binary library: the file is taken to be XML text already.
-    sink(text::decodeStoredText(text::upToFirstNul(*bytes)));
+    sink(text::decodeStoredText(text::upToFirstNul(bytes.view())));
 }
 
 std::string ZelMatFile::toXml(const MaterialPtr& material) { return materialToXml(material); }

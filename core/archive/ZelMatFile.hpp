@@ -29,9 +29,6 @@ namespace OrvexKavorCore {
 
 class ZelMatFile {
 public:
-    // The bytes of a whole file, shared with the archives that read them in place.
-    using SharedBytes = boost::shared_ptr<const std::string>;
-
     // The archive of a file, split from its 8-byte header.
     struct Framing {
         std::uint16_t generation = 0;

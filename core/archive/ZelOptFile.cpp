@@ -22,12 +22,12 @@ bool ZelOptFile::writeFile(OrvexSerializable& object, const std::filesystem::pat
 
 bool ZelOptFile::readFile(OrvexSerializable& object, const std::filesystem::path& path) {
     lastReadFailure_.reset();
-    const std::optional<std::string> bytes = readRegularFile(path);
+    const std::optional<SharedBytes> bytes = readRegularFile(path);
     if (!bytes) {
         lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
         return false;
     }
-    return readBytes(object, *bytes);
+    return readBytes(object, bytes->view());
 }
 
 bool ZelOptFile::readBytes(OrvexSerializable& object, std::string_view bytes) {
@@ -50,12 +50,12 @@ std::string ZelOptFile::toXml(const std::filesystem::path& path) {
 }
 
 void ZelOptFile::toXml(const std::filesystem::path& path, const TextSink& sink) {
-    const std::optional<std::string> bytes = readRegularFile(path);
+    const std::optional<SharedBytes> bytes = readRegularFile(path);
     if (!bytes) {
         lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
         return;
     }
-    bytesToXml(*bytes, sink);
+    bytesToXml(bytes->view(), sink);
 }
 
 void ZelOptFile::bytesToXml(std::string_view bytes, const TextSink& sink) {

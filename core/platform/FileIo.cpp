@@ -27,17 +27,19 @@ private:
 
 } // namespace
 
-std::optional<std::string> readRegularFile(const std::filesystem::path& path) {
+std::optional<SharedBytes> readRegularFile(const std::filesystem::path& path) {
     // O_NONBLOCK: opening a FIFO for reading must not wait for a writer.
     FileDescriptor file(::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
     if (file.get() < 0) return std::nullopt;
     struct stat info {};
     if (::fstat(file.get(), &info) != 0 || !S_ISREG(info.st_mode)) return std::nullopt;
 
-    std::string content(static_cast<std::size_t>(info.st_size), '\0');
+    const auto size = static_cast<std::size_t>(info.st_size);
+    char* data = nullptr;
+    SharedBytes content = SharedBytes::allocate(size, data);
     std::size_t done = 0;
-    while (done < content.size()) {
-        const ssize_t n = ::read(file.get(), content.data() + done, content.size() - done);
+    while (done < size) {
+        const ssize_t n = ::read(file.get(), data + done, size - done);
         if (n < 0 && errno == EINTR) continue;
         if (n <= 0) return std::nullopt; // error, or the file shrank while we read it
         done += static_cast<std::size_t>(n);

@@ -1,5 +1,7 @@
 #pragma once
 // Reading and writing whole files.
+#include "platform/SharedBytes.hpp"
+
 #include <filesystem>
 #include <optional>
 #include <string>
@@ -10,7 +12,7 @@ namespace OrvexKavorCore {
 // The whole content of a regular file. A directory, FIFO, device or socket, a file
 // that does not exist or cannot be opened, or a read that delivers fewer bytes
 // than the file holds give nullopt. Never blocks on a FIFO.
-std::optional<std::string> readRegularFile(const std::filesystem::path& path);
+std::optional<SharedBytes> readRegularFile(const std::filesystem::path& path);
 
 // A file written piece by piece into a temporary file beside its target and renamed
 // over the target by commit(), so that readers never see a part of it. Destroyed

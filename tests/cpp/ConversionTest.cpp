@@ -68,7 +68,7 @@ TEST_F(Conversions, StreamingSendsEachMaterialAndMatchesTheWholeDocument) {
 
     std::vector<std::string> pieces;
     resetSharedDefaultSun();
-    ZelMatFile().bytesToXml(boost::make_shared<const std::string>(bytes),
+    ZelMatFile().bytesToXml(SharedBytes::copyOf(bytes),
                             [&](std::string_view piece) { pieces.emplace_back(piece); });
     ASSERT_EQ(pieces.size(), 3u);
     for (const std::string& piece : pieces) EXPECT_TRUE(piece.starts_with("<Assets>")) << piece;
@@ -85,7 +85,7 @@ TEST_F(Conversions, ALibraryFailingAtItsLastMaterialSendsNoMaterial) {
 
     std::vector<std::string> pieces;
     ZelMatFile file;
-    file.bytesToXml(boost::make_shared<const std::string>(bytes),
+    file.bytesToXml(SharedBytes::copyOf(bytes),
                     [&](std::string_view piece) { pieces.emplace_back(piece); });
     EXPECT_EQ(pieces, std::vector<std::string>{""}); // the pass-through text: the header starts with a NUL
     ASSERT_TRUE(file.lastReadFailure());

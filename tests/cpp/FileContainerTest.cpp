@@ -184,6 +184,8 @@ TEST(Conversion, FilesThatAreNotBinaryPassThroughAsText) {
         EXPECT_EQ(convertToXml(kind, dir.file("e" + ext, "")), "");
         EXPECT_EQ(convertToXml(kind, dir.file("n" + ext, std::string("ab\0cd", 5))), "ab");
         EXPECT_EQ(convertToXml(kind, dir.file("w" + ext, "caf\xE9")), "caf\xC3\xA9");
+        const std::string large(3'000'017, 'x'); // read into a buffer of huge pages
+        EXPECT_EQ(convertToXml(kind, dir.file("l" + ext, large)), large);
         EXPECT_EQ(convertToXml(kind, dir.path() / ("missing" + ext)), "");
         EXPECT_EQ(convertToXml(kind, dir.path()), ""); // a directory cannot be opened
         const fs::path fifo = dir.path() / ("fifo" + ext);
