@@ -130,7 +130,7 @@ void QuickArchive::putRaw(const void* data, std::size_t length) {
     }
 }
 
-bool QuickArchive::getRaw(void* data, std::size_t length) {
+bool QuickArchive::getRawAcrossChunks(void* data, std::size_t length) {
     auto* bytes = static_cast<std::uint8_t*>(data);
     bool complete = true;
     while (length > 0) {
@@ -327,22 +327,9 @@ bool QuickArchive::fail(std::string_view reason) {
     return false;
 }
 
-QuickArchive::Scope::Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index)
-    : Scope(ar, what, name, index, true) {}
-
-QuickArchive::Scope::Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index, bool nests)
-    : ar_(ar), nests_(nests), pushed_(ar.frames_.size() < kMaxNesting), ok_(true) {
-    // The path is kept only up to the limit: deeper frames add nothing a user needs.
-    if (pushed_) ar_.frames_.push_back(Frame{what, name, index});
-    if (nests_ && ++ar_.nesting_ > kMaxNesting) {
-        ok_ = false;
-        ar_.fail("records nested deeper than " + std::to_string(kMaxNesting) + " levels");
-    }
-}
-
-QuickArchive::Scope::~Scope() {
-    if (nests_) --ar_.nesting_;
-    if (pushed_) ar_.frames_.pop_back();
+void QuickArchive::Scope::tooDeep() {
+    ok_ = false;
+    ar_.fail("records nested deeper than " + std::to_string(kMaxNesting) + " levels");
 }
 
 } // namespace OrvexKavorCore

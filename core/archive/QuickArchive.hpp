@@ -20,6 +20,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <filesystem>
 #include <iosfwd>
 #include <optional>
@@ -98,7 +99,17 @@ public:
     void putRaw(const void* data, std::size_t length);
     // Reads `length` bytes; bytes past the last chunk leave the destination as it was.
     // True when every byte was delivered.
-    bool getRaw(void* data, std::size_t length);
+    bool getRaw(void* data, std::size_t length) {
+        // Most values lie inside one chunk: copy them at once.
+        const std::uint64_t index = readPos_ / kChunkSize;
+        const std::size_t offset = static_cast<std::size_t>(readPos_ % kChunkSize);
+        if (index < chunks_.size() && length <= kChunkSize - offset) {
+            std::memcpy(data, chunks_[index]->data() + offset, length);
+            readPos_ += length;
+            return true;
+        }
+        return getRawAcrossChunks(data, length);
+    }
 
     // --- primitives (little-endian, packed) ---
     void write(bool v) { putByte(v ? 1 : 0); }
@@ -179,16 +190,26 @@ public:
     class Scope {
     public:
         // A nested member: counts towards the nesting limit.
-        Scope(QuickArchive& ar, const char* what, const char* name = nullptr, std::int64_t index = -1);
+        Scope(QuickArchive& ar, const char* what, const char* name = nullptr, std::int64_t index = -1)
+            : Scope(ar, what, name, index, true) {}
         // A label only (a field of a flat record): does not count as nesting.
         static Scope label(QuickArchive& ar, const char* name) { return Scope(ar, nullptr, name, -1, false); }
-        ~Scope();
+        ~Scope() {
+            if (nests_) --ar_.nesting_;
+            if (pushed_) ar_.frames_.pop_back();
+        }
         Scope(const Scope&) = delete;
         Scope& operator=(const Scope&) = delete;
         explicit operator bool() const { return ok_; }
 
     private:
-        Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index, bool nests);
+        Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index, bool nests)
+            : ar_(ar), nests_(nests), pushed_(ar.frames_.size() < kMaxNesting), ok_(true) {
+            // The path is kept only up to the limit: deeper frames add nothing a user needs.
+            if (pushed_) ar_.frames_.push_back(Frame{what, name, index});
+            if (nests_ && ++ar_.nesting_ > kMaxNesting) tooDeep();
+        }
+        void tooDeep();
         QuickArchive& ar_;
         bool nests_;
         bool pushed_;
@@ -203,6 +224,7 @@ private:
     };
 
     Chunk& chunkFor(std::uint64_t position);
+    bool getRawAcrossChunks(void* data, std::size_t length);
     std::string recordPath() const;
 
     std::vector<boost::shared_ptr<Chunk>> chunks_;

@@ -18,50 +18,50 @@ namespace OrvexKavorCore {
 
 namespace {
 
-// Which characters an escaping replaces: all five of XML's predefined entities
-// (attribute values and entries), or only & < > (element text that keeps its
-// quotes and apostrophes as they are).
-enum class Escape { kAll, kMarkup };
+// Indentation is copied from here, in pieces for deeper lines.
+constexpr std::string_view kSpaces = "                                                                ";
 
-// Appends `text` with the characters that need it replaced by entities. Runs of
-// other characters are copied in one piece, as they are (UTF-8 text) or widened
-// byte for byte (narrow text). Every replaced character is ASCII, so escaping a
+// The entity replacing `c`, or nothing. Element text keeps its quotes and
+// apostrophes; attribute values and entries replace all five.
+template <bool kAllEntities>
+std::string_view entityFor(char c) {
+    switch (c) {
+    case '&': return "&amp;";
+    case '<': return "&lt;";
+    case '>': return "&gt;";
+    case '"': return kAllEntities ? "&quot;" : std::string_view();
+    case '\'': return kAllEntities ? "&apos;" : std::string_view();
+    default: return {};
+    }
+}
+
+// Calls `copy` on each run of `text` without entities and `entity` for each
+// character that needs one. Every replaced character is ASCII, so escaping a
 // narrow text before widening it is the same as escaping after.
-template <Escape kind, bool narrow>
-void appendWithEntities(std::string& out, std::string_view text) {
-    const auto copy = [&out](std::string_view run) {
-        if constexpr (narrow)
-            text::appendLatin1AsUtf8(out, run);
-        else
-            out.append(run);
-    };
+template <bool kAllEntities, class Copy, class Entity>
+void splitAtEntities(std::string_view text, Copy copy, Entity entity) {
     std::size_t start = 0;
     for (std::size_t i = 0; i < text.size(); ++i) {
-        std::string_view entity;
-        switch (text[i]) {
-        case '&': entity = "&amp;"; break;
-        case '<': entity = "&lt;"; break;
-        case '>': entity = "&gt;"; break;
-        case '"':
-            if (kind == Escape::kAll) entity = "&quot;";
-            break;
-        case '\'':
-            if (kind == Escape::kAll) entity = "&apos;";
-            break;
-        default: break;
-        }
-        if (entity.empty()) continue;
+        const std::string_view replacement = entityFor<kAllEntities>(text[i]);
+        if (replacement.empty()) continue;
         copy(text.substr(start, i - start));
-        out.append(entity);
+        entity(replacement);
         start = i + 1;
     }
     copy(text.substr(start));
 }
 
+bool isAscii(std::string_view text) {
+    unsigned char seen = 0; // no early exit: the loop vectorises
+    for (char c : text) seen |= static_cast<unsigned char>(c);
+    return seen < 0x80;
+}
+
 } // namespace
 
 void appendEscaped(std::string& out, std::string_view text) {
-    appendWithEntities<Escape::kAll, false>(out, text);
+    const auto append = [&out](std::string_view piece) { out.append(piece); };
+    splitAtEntities<true>(text, append, append);
 }
 
 std::string escapeXml(std::string_view text) {
@@ -71,102 +71,86 @@ std::string escapeXml(std::string_view text) {
     return escaped;
 }
 
-// --- helpers ---
+// --- the pending text ---
 
-namespace {
-
-// Indentation is copied from here; deeper lines fall back to filling.
-constexpr std::string_view kSpaces = "                                                                ";
-constexpr std::size_t kMaxTag = 16;
-
-// Appends indentation, "<tag>", the number that `writeNumber(char*)` writes
-// (at most 16 characters) and "</tag>" with a line feed. The line is gathered on
-// the stack and appended at once, as these lines make up most of a document.
-template <class WriteNumber>
-void appendNumberLine(std::string& out, std::size_t width, std::string_view tag, WriteNumber writeNumber) {
-    char text[kSpaces.size() + 2 * kMaxTag + 32];
-    char* p = text;
-    if (width <= kSpaces.size()) {
-        std::memcpy(p, kSpaces.data(), width);
-        p += width;
-    } else {
-        out.append(width, ' ');
-    }
-    if (tag.size() > kMaxTag) { // never for the writer's own tags
-        out.append(text, static_cast<std::size_t>(p - text));
-        out.push_back('<');
-        out.append(tag);
-        out.push_back('>');
-        char number[kMaxFloatChars];
-        out.append(number, static_cast<std::size_t>(writeNumber(number) - number));
-        out.append("</");
-        out.append(tag);
-        out.append(">\n");
-        return;
-    }
-    *p++ = '<';
-    std::memcpy(p, tag.data(), tag.size());
-    p += tag.size();
-    *p++ = '>';
-    p = writeNumber(p);
-    *p++ = '<';
-    *p++ = '/';
-    std::memcpy(p, tag.data(), tag.size());
-    p += tag.size();
-    *p++ = '>';
-    *p++ = '\n';
-    out.append(text, static_cast<std::size_t>(p - text));
+void AssetXmlWriter::flush() {
+    out_.append(pending_, pendingSize_);
+    pendingSize_ = 0;
 }
 
-// Appends indentation and `text` (and a line feed) with a single append when
-// they fit on the stack.
-void appendIndented(std::string& out, std::size_t width, std::string_view text, bool lineFeed) {
-    char line[kSpaces.size() + 32];
-    if (width <= kSpaces.size() && text.size() < 32) {
-        std::memcpy(line, kSpaces.data(), width);
-        std::memcpy(line + width, text.data(), text.size());
-        std::size_t size = width + text.size();
-        if (lineFeed) line[size++] = '\n';
-        out.append(line, size);
-        return;
-    }
-    out.append(width, ' ');
-    out.append(text);
-    if (lineFeed) out.push_back('\n');
+void AssetXmlWriter::putLong(std::string_view text) {
+    flush();
+    if (text.size() <= kPendingSize) return put(text);
+    out_.append(text);
 }
 
-} // namespace
-
-void AssetXmlWriter::indent() {
-    const std::size_t width = 2 * static_cast<std::size_t>(depth_);
-    if (width <= kSpaces.size())
-        out_.append(kSpaces.data(), width);
-    else
-        out_.append(width, ' ');
-}
-
-void AssetXmlWriter::line(std::string_view text) {
-    appendIndented(out_, 2 * static_cast<std::size_t>(depth_), text, true);
-}
-
-void AssetXmlWriter::appendNarrow(std::string_view narrow) {
+void AssetXmlWriter::putNarrow(std::string_view narrow) {
+    if (isAscii(narrow)) return put(narrow);
+    flush();
     text::appendLatin1AsUtf8(out_, narrow);
 }
 
+template <bool kAllEntities, bool kNarrow>
+void AssetXmlWriter::putWithEntities(std::string_view text) {
+    const auto copy = [this](std::string_view run) {
+        if constexpr (kNarrow)
+            putNarrow(run);
+        else
+            put(run);
+    };
+    splitAtEntities<kAllEntities>(text, copy, [this](std::string_view entity) { put(entity); });
+}
+
+void AssetXmlWriter::writeText(std::string_view text) {
+    put(text);
+    flush();
+}
+
+// --- helpers ---
+
+void AssetXmlWriter::indent() {
+    std::size_t width = 2 * static_cast<std::size_t>(depth_);
+    for (; width > kSpaces.size(); width -= kSpaces.size()) put(kSpaces);
+    put(kSpaces.substr(0, width));
+}
+
+void AssetXmlWriter::line(std::string_view text) {
+    indent();
+    put(text);
+    put('\n');
+}
+
+void AssetXmlWriter::inlineValueStart() {
+    indent();
+    put("<value>");
+}
+
 void AssetXmlWriter::inlineValue(std::string_view text) {
-    beginInlineValue();
-    out_.append(text);
-    endInlineValue();
+    inlineValueStart();
+    put(text);
+    inlineValueEnd();
+}
+
+// Indentation, "<tag>", the number `writeNumber(char*)` writes (at most
+// kMaxFloatChars characters) and "</tag>" with a line feed.
+template <class WriteNumber>
+void AssetXmlWriter::numberLine(std::string_view tag, WriteNumber writeNumber) {
+    indent();
+    put('<');
+    put(tag);
+    put('>');
+    advance(writeNumber(room(kMaxFloatChars)));
+    put("</");
+    put(tag);
+    put(">\n");
 }
 
 void AssetXmlWriter::floatLine(std::string_view tag, float value) {
-    appendNumberLine(out_, 2 * static_cast<std::size_t>(depth_), tag,
-                     [value](char* p) { return formatFloatTo(p, value); });
+    numberLine(tag, [value](char* p) { return formatFloatTo(p, value); });
 }
 
 void AssetXmlWriter::integerLine(std::string_view tag, std::int32_t value) {
-    appendNumberLine(out_, 2 * static_cast<std::size_t>(depth_), tag,
-                     [value](char* p) { return std::to_chars(p, p + 11, value).ptr; });
+    numberLine(tag, [value](char* p) { return std::to_chars(p, p + 11, value).ptr; });
 }
 
 void AssetXmlWriter::vectorBlock(const Vector& v) {
@@ -194,80 +178,110 @@ void AssetXmlWriter::componentLines(const TransformComponents& c) {
     integerLine("z_mirror", c.z_mirror);
 }
 
+void AssetXmlWriter::parameterStart(std::string_view name, std::string_view type, std::string_view label,
+                                    std::string_view listType, bool userData) {
+    indent();
+    put("<parameter type=\"");
+    putNarrow(type);
+    put("\" name=\"");
+    putNarrow(name);
+    put("\" listType=\"");
+    putNarrow(listType);
+    put('"');
+    if (userData) put(" isUserData=\"1\"");
+    put(" label=\"");
+    putNarrow(label.empty() ? name : label);
+    put("\">\n");
+    ++depth_;
+}
+
+void AssetXmlWriter::parameterEnd() {
+    decreaseDepth();
+    line("</parameter>");
+}
+
 void AssetXmlWriter::beginBlockParameter(std::string_view name, std::string_view type, std::string_view label) {
-    beginParameter(name, type, label, "none", false);
-    beginValueBlock();
+    parameterStart(name, type, label, "none", false);
+    line("<value>");
     ++depth_;
 }
 
 void AssetXmlWriter::endBlockParameter() {
     decreaseDepth();
-    endValueBlock();
-    endParameter();
+    line("</value>");
+    parameterEnd();
+    flush();
 }
 
 // The reference text: the escaped path, "/", and the last part (a material's
 // escaped name, or the plugin type of the other families, widened).
 void AssetXmlWriter::pluginReference(std::string_view name, std::string_view path, std::string_view last,
                                      bool escapeLast, std::string_view label) {
-    beginParameter(name, "plugin", label, "none", false);
-    beginInlineValue();
-    appendEscaped(out_, path);
-    out_.push_back('/');
+    parameterStart(name, "plugin", label, "none", false);
+    inlineValueStart();
+    putWithEntities<true, false>(path);
+    put('/');
     if (escapeLast)
-        appendEscaped(out_, last);
+        putWithEntities<true, false>(last);
     else
-        appendNarrow(last);
-    endInlineValue();
-    endParameter();
+        putNarrow(last);
+    inlineValueEnd();
+    parameterEnd();
+    flush();
 }
 
 // A reference to nothing: the parameter with no value line at all.
 void AssetXmlWriter::emptyPlugin(std::string_view name, std::string_view label) {
-    beginParameter(name, "plugin", label, "none", false);
-    endParameter();
+    parameterStart(name, "plugin", label, "none", false);
+    parameterEnd();
+    flush();
 }
 
 // --- document framing ---
 
 void AssetXmlWriter::beginDocument() {
-    out_.append("<Assets>\n");
+    put("<Assets>\n");
+    flush();
 }
 
-// Appending to a string needs no flushing.
 void AssetXmlWriter::endDocument() {
     line("</Assets>");
+    flush();
 }
 
 void AssetXmlWriter::beginElement(std::string_view name) {
     ++depth_;
-    out_.push_back('<');
-    out_.append(name);
-    out_.append(">\n");
+    put('<');
+    put(name);
+    put(">\n");
+    flush();
 }
 
 void AssetXmlWriter::endElement(std::string_view name) {
-    out_.append("</");
-    out_.append(name);
-    out_.append(">\n");
+    put("</");
+    put(name);
+    put(">\n");
     decreaseDepth();
+    flush();
 }
 
 void AssetXmlWriter::beginAsset(std::string_view url, std::string_view type, std::string_view layout) {
     ++depth_;
     indent();
-    out_.append("<Asset layout=\"");
-    appendNarrow(layout);
-    out_.append("\" renderer=\"kavor\" type=\"");
-    appendNarrow(type);
-    out_.append("\" url=\"");
-    appendEscaped(out_, url);
-    out_.append("\" >\n");
+    put("<Asset layout=\"");
+    putNarrow(layout);
+    put("\" renderer=\"kavor\" type=\"");
+    putNarrow(type);
+    put("\" url=\"");
+    putWithEntities<true, false>(url);
+    put("\" >\n");
+    flush();
 }
 
 void AssetXmlWriter::endAsset() {
     line("</Asset>");
     decreaseDepth();
+    flush();
 }
 
 void AssetXmlWriter::beginPlugin(std::string_view name, std::string_view type) {
@@ -275,11 +289,12 @@ void AssetXmlWriter::beginPlugin(std::string_view name, std::string_view type) {
     line("<plugin>");
     ++depth_;
     indent();
-    out_.append("<kavorplugin name=\"");
-    appendNarrow(name);
-    out_.append("\" type=\"");
-    appendNarrow(type);
-    out_.append("\">\n");
+    put("<kavorplugin name=\"");
+    putNarrow(name);
+    put("\" type=\"");
+    putNarrow(type);
+    put("\">\n");
+    flush();
 }
 
 void AssetXmlWriter::endPlugin() {
@@ -287,90 +302,91 @@ void AssetXmlWriter::endPlugin() {
     decreaseDepth();
     line("</plugin>");
     decreaseDepth();
+    flush();
 }
 
 void AssetXmlWriter::beginParameters() {
     ++depth_;
     line("<parameters>");
     ++depth_;
+    flush();
 }
 
 void AssetXmlWriter::endParameters() {
     decreaseDepth();
     line("</parameters>");
     decreaseDepth();
+    flush();
 }
 
 void AssetXmlWriter::beginParameter(std::string_view name, std::string_view type, std::string_view label,
                                     std::string_view listType, bool userData) {
-    indent();
-    out_.append("<parameter type=\"");
-    appendNarrow(type);
-    out_.append("\" name=\"");
-    appendNarrow(name);
-    out_.append("\" listType=\"");
-    appendNarrow(listType);
-    out_.push_back('"');
-    if (userData) out_.append(" isUserData=\"1\"");
-    out_.append(" label=\"");
-    appendNarrow(label.empty() ? name : label);
-    out_.append("\">\n");
-    ++depth_;
+    parameterStart(name, type, label, listType, userData);
+    flush();
 }
 
 void AssetXmlWriter::endParameter() {
-    decreaseDepth();
-    line("</parameter>");
+    parameterEnd();
+    flush();
 }
 
 void AssetXmlWriter::beginValueBlock() {
     line("<value>");
+    flush();
 }
 
 void AssetXmlWriter::endValueBlock() {
     line("</value>");
+    flush();
 }
 
 void AssetXmlWriter::beginInlineValue() {
-    appendIndented(out_, 2 * static_cast<std::size_t>(depth_), "<value>", false);
+    inlineValueStart();
+    flush();
 }
 
 void AssetXmlWriter::endInlineValue() {
-    out_.append("</value>\n");
+    inlineValueEnd();
+    flush();
 }
 
 // --- typed parameters ---
 
 void AssetXmlWriter::writeFloat(std::string_view name, float value, std::string_view label, bool userData) {
-    beginParameter(name, "float", label, "none", userData);
-    beginInlineValue();
-    appendFloat(out_, value);
-    endInlineValue();
-    endParameter();
+    parameterStart(name, "float", label, "none", userData);
+    inlineValueStart();
+    advance(formatFloatTo(room(kMaxFloatChars), value));
+    inlineValueEnd();
+    parameterEnd();
+    flush();
 }
 
 void AssetXmlWriter::writeInteger(std::string_view name, std::int32_t value, std::string_view label,
                                   bool userData) {
-    beginParameter(name, "integer", label, "none", userData);
-    beginInlineValue();
-    appendInteger(out_, value);
-    endInlineValue();
-    endParameter();
+    parameterStart(name, "integer", label, "none", userData);
+    inlineValueStart();
+    char* p = room(11);
+    advance(std::to_chars(p, p + 11, value).ptr);
+    inlineValueEnd();
+    parameterEnd();
+    flush();
 }
 
 void AssetXmlWriter::writeBool(std::string_view name, bool value, std::string_view label, bool userData) {
-    beginParameter(name, "bool", label, "none", userData);
+    parameterStart(name, "bool", label, "none", userData);
     inlineValue(value ? "1" : "0");
-    endParameter();
+    parameterEnd();
+    flush();
 }
 
 void AssetXmlWriter::writeString(std::string_view name, std::string_view value, std::string_view label,
                                  bool userData) {
-    beginParameter(name, "string", label, "none", userData);
-    beginInlineValue();
-    appendWithEntities<Escape::kMarkup, false>(out_, value);
-    endInlineValue();
-    endParameter();
+    parameterStart(name, "string", label, "none", userData);
+    inlineValueStart();
+    putWithEntities<false, false>(value);
+    inlineValueEnd();
+    parameterEnd();
+    flush();
 }
 
 void AssetXmlWriter::writeVector(std::string_view name, const Vector& value, std::string_view label) {
@@ -399,7 +415,7 @@ void AssetXmlWriter::writeAColor(std::string_view name, const AColor& value, std
 // The matrix element follows an empty line.
 void AssetXmlWriter::writeMatrix(std::string_view name, const Matrix& value, std::string_view label) {
     beginBlockParameter(name, "matrix", label);
-    out_.push_back('\n');
+    put('\n');
     line("<matrix>");
     ++depth_;
     for (const Vector& column : value.m) vectorBlock(column);
@@ -472,11 +488,12 @@ void AssetXmlWriter::writePlugin(std::string_view name, const boost::shared_ptr<
 void AssetXmlWriter::writeSunPlugin(std::string_view name, const boost::shared_ptr<BaseLight>& sun,
                                     std::string_view url, std::string_view label) {
     if (!sun) return emptyPlugin(name, label);
-    beginParameter(name, "plugin", label, "none", false);
-    beginInlineValue();
-    appendEscaped(out_, url);
-    endInlineValue();
-    endParameter();
+    parameterStart(name, "plugin", label, "none", false);
+    inlineValueStart();
+    putWithEntities<true, false>(url);
+    inlineValueEnd();
+    parameterEnd();
+    flush();
 }
 
 void AssetXmlWriter::writePlugin(std::string_view name, const boost::any& object, std::string_view path,
@@ -503,31 +520,35 @@ void AssetXmlWriter::writePlugin(std::string_view name, const boost::any& object
 
 // "<list>" stands at the level of "<value>"; the entries one level deeper.
 void AssetXmlWriter::beginList(std::string_view name, std::string_view listType, std::string_view label) {
-    beginParameter(name, "list", label, listType, false);
-    beginValueBlock();
+    parameterStart(name, "list", label, listType, false);
+    line("<value>");
     line("<list>");
     ++depth_;
+    flush();
 }
 
 void AssetXmlWriter::writeEntry(std::string_view text) {
     indent();
-    out_.append("<entry>");
-    appendEscaped(out_, text);
-    out_.append("</entry>\n");
+    put("<entry>");
+    putWithEntities<true, false>(text);
+    put("</entry>\n");
+    flush();
 }
 
 void AssetXmlWriter::writeStringEntry(std::string_view text) {
     indent();
-    out_.append("<string>\"");
-    appendWithEntities<Escape::kMarkup, true>(out_, text);
-    out_.append("\"</string>\n");
+    put("<string>\"");
+    putWithEntities<false, true>(text);
+    put("\"</string>\n");
+    flush();
 }
 
 void AssetXmlWriter::endList() {
     decreaseDepth();
     line("</list>");
-    endValueBlock();
-    endParameter();
+    line("</value>");
+    parameterEnd();
+    flush();
 }
 
 } // namespace OrvexKavorCore

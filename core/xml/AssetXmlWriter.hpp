@@ -27,6 +27,7 @@
 #include <boost/shared_ptr.hpp>
 
 #include <cstdint>
+#include <cstring>
 #include <map>
 #include <string>
 #include <string_view>
@@ -73,7 +74,7 @@ public:
     void endValueBlock();
     void beginInlineValue();
     void endInlineValue();
-    void writeText(std::string_view text) { out_.append(text); }
+    void writeText(std::string_view text);
     void increaseDepth() { ++depth_; }
     // Never below 0: an unbalanced end must not wrap the depth into billions of spaces.
     void decreaseDepth() {
@@ -129,10 +130,44 @@ public:
     void endList();
 
 private:
+    // Text is gathered in `pending_` and appended to the output a piece at a time:
+    // a parameter is a few short lines, and one append costs far less than the
+    // dozen its parts would take. Every public member function ends with flush(),
+    // so that the output is complete whenever the caller sees it.
+    static constexpr std::size_t kPendingSize = 2048;
+    void put(std::string_view text) {
+        if (kPendingSize - pendingSize_ < text.size()) return putLong(text);
+        std::memcpy(pending_ + pendingSize_, text.data(), text.size());
+        pendingSize_ += text.size();
+    }
+    void put(char c) {
+        if (pendingSize_ == kPendingSize) flush();
+        pending_[pendingSize_++] = c;
+    }
+    void putLong(std::string_view text);
+    // Latin-1 text, widened to UTF-8.
+    void putNarrow(std::string_view narrow);
+    template <bool kAllEntities, bool kNarrow>
+    void putWithEntities(std::string_view text);
+    // At least `size` (at most kPendingSize) free bytes at the returned position;
+    // advance(end) takes what was written there.
+    char* room(std::size_t size) {
+        if (kPendingSize - pendingSize_ < size) flush();
+        return pending_ + pendingSize_;
+    }
+    void advance(char* end) { pendingSize_ = static_cast<std::size_t>(end - pending_); }
+    void flush();
+
     void indent();
     void line(std::string_view text); // indent, text, line feed
-    void appendNarrow(std::string_view narrow);
+    void parameterStart(std::string_view name, std::string_view type, std::string_view label,
+                        std::string_view listType, bool userData);
+    void parameterEnd();
+    void inlineValueStart();
+    void inlineValueEnd() { put("</value>\n"); }
     void inlineValue(std::string_view text);
+    template <class WriteNumber>
+    void numberLine(std::string_view tag, WriteNumber writeNumber);
     void floatLine(std::string_view tag, float value);
     void integerLine(std::string_view tag, std::int32_t value);
     void beginBlockParameter(std::string_view name, std::string_view type, std::string_view label);
@@ -144,6 +179,8 @@ private:
     void emptyPlugin(std::string_view name, std::string_view label);
 
     std::string& out_;
+    char pending_[kPendingSize];
+    std::size_t pendingSize_ = 0;
     std::uint32_t depth_ = 0;
     std::map<std::string, std::string> sunUrls_;
 };

@@ -170,9 +170,10 @@ char* formatFloatTo(char* p, float value) {
         std::memcpy(p, "inf", 3);
         return p + 3;
     }
-    if (magnitude == 0.0f) {
-        *p++ = '0';
-        return p;
+    // Whole numbers below 10^6 (the many 0s, 1s and 100s) are their own six-digit text.
+    if (magnitude < 1e6f) {
+        const auto whole = static_cast<std::int32_t>(magnitude);
+        if (static_cast<float>(whole) == magnitude) return std::to_chars(p, p + 7, whole).ptr;
     }
     Decimal d;
     sixDigits(magnitude, d);

@@ -66,8 +66,8 @@ std::string expectedText(float value) {
 } // namespace
 
 TEST(NumberFormat, AgreesWithTheCLibraryOnSampledFloats) {
-    // Bit patterns spread over every exponent and both signs, and the floats
-    // around values that lie exactly halfway.
+    // Bit patterns spread over every exponent and both signs, the floats around
+    // values that lie exactly halfway, and whole numbers on both sides of 10^6.
     std::vector<float> values;
     for (std::uint64_t bits = 0; bits < 0x100000000ull; bits += 65521)
         values.push_back(std::bit_cast<float>(static_cast<std::uint32_t>(bits)));
@@ -76,6 +76,7 @@ TEST(NumberFormat, AgreesWithTheCLibraryOnSampledFloats) {
         for (int i = 0; i < 1000; ++i) f = std::nextafter(f, 0.0f);
         for (int i = 0; i < 2000; ++i, f = std::nextafter(f, INFINITY)) values.push_back(f);
     }
+    for (int whole = -1'100'000; whole <= 1'100'000; whole += 97) values.push_back(static_cast<float>(whole));
     int mismatches = 0;
     for (float value : values) {
         if (!std::isfinite(value)) continue;
