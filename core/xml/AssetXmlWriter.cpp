@@ -51,12 +51,6 @@ void splitAtEntities(std::string_view text, Copy copy, Entity entity) {
     copy(text.substr(start));
 }
 
-bool isAscii(std::string_view text) {
-    unsigned char seen = 0; // no early exit: the loop vectorises
-    for (char c : text) seen |= static_cast<unsigned char>(c);
-    return seen < 0x80;
-}
-
 } // namespace
 
 void appendEscaped(std::string& out, std::string_view text) {
@@ -85,7 +79,7 @@ void AssetXmlWriter::putLong(std::string_view text) {
 }
 
 void AssetXmlWriter::putNarrow(std::string_view narrow) {
-    if (isAscii(narrow)) return put(narrow);
+    if (isAsciiText(narrow)) return put(narrow);
     flush();
     text::appendLatin1AsUtf8(out_, narrow);
 }

@@ -22,12 +22,12 @@
 //     </Asset>
 //   </Assets>
 #include "platform/KavorTypes.hpp"
+#include "xml/ShortCopy.hpp"
 
 #include <boost/any.hpp>
 #include <boost/shared_ptr.hpp>
 
 #include <cstdint>
-#include <cstring>
 #include <map>
 #include <string>
 #include <string_view>
@@ -137,7 +137,7 @@ private:
     static constexpr std::size_t kPendingSize = 2048;
     void put(std::string_view text) {
         if (kPendingSize - pendingSize_ < text.size()) return putLong(text);
-        std::memcpy(pending_ + pendingSize_, text.data(), text.size());
+        copyShort(pending_ + pendingSize_, text.data(), text.size());
         pendingSize_ += text.size();
     }
     void put(char c) {
