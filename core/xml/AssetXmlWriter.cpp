@@ -102,7 +102,7 @@ void AssetXmlWriter::writeText(std::string_view text) {
 
 // --- helpers ---
 
-void AssetXmlWriter::indent() {
+void AssetXmlWriter::indentDeep() {
     std::size_t width = 2 * static_cast<std::size_t>(depth_);
     for (; width > kSpaces.size(); width -= kSpaces.size()) put(kSpaces);
     put(kSpaces.substr(0, width));

@@ -158,7 +158,17 @@ private:
     void advance(char* end) { pendingSize_ = static_cast<std::size_t>(end - pending_); }
     void flush();
 
-    void indent();
+    // Two spaces per level. Up to 32 levels, a fixed run of spaces is stored and
+    // only the indentation kept, which needs no loop and no call.
+    void indent() {
+        constexpr std::size_t kShallow = 64;
+        const std::size_t width = 2 * static_cast<std::size_t>(depth_);
+        if (width > kShallow) return indentDeep();
+        char* at = room(kShallow);
+        std::memset(at, ' ', kShallow);
+        advance(at + width);
+    }
+    void indentDeep();
     void line(std::string_view text); // indent, text, line feed
     void parameterStart(std::string_view name, std::string_view type, std::string_view label,
                         std::string_view listType, bool userData);
