@@ -11,6 +11,7 @@
 #define PY_SSIZE_T_CLEAN
 #include <Python.h>
 
+#include "PythonText.hpp"
 #include "archive/Conversion.hpp"
 #include "platform/Text.hpp"
 
@@ -154,9 +155,7 @@ void withoutInterpreterLock(Work&& work) {
     if (failure) std::rethrow_exception(failure);
 }
 
-PyObject* textObject(std::string_view text) {
-    return PyUnicode_DecodeUTF8(text.data(), static_cast<Py_ssize_t>(text.size()), "strict");
-}
+PyObject* textObject(std::string_view text) { return dexmor::python::strFromUtf8(text); }
 
 // The body of the conversion calls. C++ exceptions leave it only while the
 // interpreter lock is held.
@@ -170,8 +169,7 @@ PyObject* convertFile(PyObject* args, const Call& call) {
     thread_local std::string xml;
     xml.clear();
     withoutInterpreterLock([&] {
-        core::convertToXml(file->kind, std::filesystem::path(std::move(file->path)),
-                           [](std::string_view piece) { xml.append(piece); });
+        core::appendXml(file->kind, std::filesystem::path(std::move(file->path)), xml);
     });
     PyObject* result = textObject(core::text::upToFirstNul(xml));
     if (xml.capacity() > kKeptCapacity) std::string().swap(xml);

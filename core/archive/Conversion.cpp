@@ -7,8 +7,6 @@
 #include "platform/Text.hpp"
 #include "textures/SkyTexture.hpp"
 
-#include <boost/make_shared.hpp>
-
 #include <algorithm>
 #include <cstring>
 
@@ -37,19 +35,24 @@ void convertToXml(FileKind kind, const std::filesystem::path& path, const TextSi
         ZelOptFile().toXml(path, sink);
 }
 
+void appendXml(FileKind kind, const std::filesystem::path& path, std::string& document) {
+    if (kind == FileKind::RenderOptions)
+        return convertToXml(kind, path, [&document](std::string_view piece) { document.append(piece); });
+    if (const std::optional<SharedBytes> bytes = readRegularFile(path)) ZelMatFile().bytesToXml(*bytes, document);
+}
+
 std::string convertToXml(FileKind kind, const std::filesystem::path& path) {
     std::string xml;
-    convertToXml(kind, path, [&xml](std::string_view piece) { xml.append(piece); });
+    appendXml(kind, path, xml);
     return xml;
 }
 
 std::string convertBytesToXml(FileKind kind, std::string_view bytes) {
     std::string xml;
-    const TextSink sink = [&xml](std::string_view piece) { xml.append(piece); };
     if (kind == FileKind::MaterialLibrary)
-        ZelMatFile().bytesToXml(SharedBytes::copyOf(bytes), sink);
+        ZelMatFile().bytesToXml(SharedBytes::copyOf(bytes), xml);
     else
-        ZelOptFile().bytesToXml(bytes, sink);
+        ZelOptFile().bytesToXml(bytes, [&xml](std::string_view piece) { xml.append(piece); });
     return xml;
 }
 

@@ -35,6 +35,9 @@ std::string convertToXml(FileKind kind, const std::filesystem::path& path);
 // The same, streamed: a material library is sent one material's block at a time
 // and never held whole (the file's bytes are, once).
 void convertToXml(FileKind kind, const std::filesystem::path& path, const TextSink& sink);
+// The same, appended to `document`. The text is whole before anyone sees it, so a
+// material library is read once, not twice as when streamed.
+void appendXml(FileKind kind, const std::filesystem::path& path, std::string& document);
 // The same for the bytes of a file in memory.
 std::string convertBytesToXml(FileKind kind, std::string_view bytes);
 

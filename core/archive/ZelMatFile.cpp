@@ -3,9 +3,12 @@
 #include "lights/SunLight.hpp"
 #include "materials/MaterialAssets.hpp"
 #include "platform/FileIo.hpp"
+#include "platform/HugePages.hpp"
 #include "platform/Text.hpp"
 #include "textures/SkyTexture.hpp"
 #include "xml/AssetXmlWriter.hpp"
+
+#include <boost/make_shared.hpp>
 
 #include <algorithm>
 #include <cstring>
@@ -101,6 +104,14 @@ std::uint64_t ZelMatFile::Framing::fileOffsetOf(std::uint64_t archivePosition) c
     return bytes.size() + (archivePosition - kept); // positions past the end count on from it
 }
 
+std::optional<ZelMatFile::Framing> ZelMatFile::frame(const SharedBytes& bytes) {
+    lastReadFailure_.reset();
+    ReadFailure failure;
+    std::optional<Framing> framing = readFraming(bytes, &failure);
+    if (!framing) lastReadFailure_ = std::move(failure);
+    return framing;
+}
+
 bool ZelMatFile::readMaterials(Framing& framing, const std::function<void(MaterialPtr&&)>& take) {
     QuickArchive& ar = framing.archive;
     // A material record takes at least a kind id and a version word.
@@ -131,13 +142,8 @@ bool ZelMatFile::readFromBytes(std::string_view bytes) {
 }
 
 bool ZelMatFile::readFromBytes(const SharedBytes& bytes) {
-    lastReadFailure_.reset();
-    ReadFailure headerFailure;
-    std::optional<Framing> framing = readFraming(bytes, &headerFailure);
-    if (!framing) {
-        lastReadFailure_ = std::move(headerFailure);
-        return false;
-    }
+    std::optional<Framing> framing = frame(bytes);
+    if (!framing) return false;
     std::vector<MaterialPtr> read;
     if (!readMaterials(*framing, [&](MaterialPtr&& material) { read.push_back(std::move(material)); }))
         return false;
@@ -225,13 +231,8 @@ std::ios_base::openmode ZelMatFile::probeOpenMode(const std::filesystem::path& p
 }
 
 std::optional<ZelMatFile::Framing> ZelMatFile::readThrough(const SharedBytes& bytes) {
-    lastReadFailure_.reset();
-    ReadFailure headerFailure;
-    std::optional<Framing> framing = readFraming(bytes, &headerFailure);
-    if (!framing) {
-        lastReadFailure_ = std::move(headerFailure);
-        return std::nullopt;
-    }
+    std::optional<Framing> framing = frame(bytes);
+    if (!framing) return std::nullopt;
     if (!readMaterials(*framing, [](MaterialPtr&&) {})) return std::nullopt;
     return framing;
 }
@@ -260,9 +261,44 @@ bool ZelMatFile::writeXml(const SharedBytes& bytes, const TextSink& sink) {
     });
 }
 
+bool ZelMatFile::appendXml(const SharedBytes& bytes, std::string& document) {
+    const std::size_t start = document.size();
+    const boost::shared_ptr<SunLight> defaultSun = sharedDefaultSun();
+    const SunLight pristineSun = *defaultSun;
+    std::optional<Framing> framing = frame(bytes);
+    if (!framing) return false;
+    // Every sky that uses the default sun shows the state the last sky record
+    // leaves it in. The blocks written here show the state of their moment, which
+    // is that one only if no later record changes it.
+    boost::shared_ptr<SunLight> sunOfFirstBlock;
+    bool sunChanged = false;
+    // A library's document is some twenty times its size: room for that at once
+    // spares the copies of growing step by step (room not written costs nothing).
+    constexpr std::size_t kExpectedGrowth = 24;
+    reserveForAppend(document, bytes.size() * kExpectedGrowth);
+    AssetXmlWriter writer(document);
+    const bool read = readMaterials(*framing, [&](MaterialPtr&& material) {
+        if (!sunOfFirstBlock)
+            sunOfFirstBlock = boost::make_shared<SunLight>(*defaultSun);
+        else if (!sunChanged)
+            sunChanged = !defaultSun->isEqual(sunOfFirstBlock);
+        writeMaterialAssets(writer, material);
+    });
+    if (read && !sunChanged) return true;
+    document.resize(start);
+    if (!read) return false;
+    *defaultSun = pristineSun;
+    return writeXml(bytes, [&document](std::string_view piece) { document.append(piece); });
+}
+
 std::string ZelMatFile::toXml(const std::filesystem::path& path) {
     std::string xml;
-    toXml(path, [&xml](std::string_view piece) { xml.append(piece); });
+    const std::optional<SharedBytes> bytes = readRegularFile(path);
+    if (!bytes) {
+        lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
+        return xml;
+    }
+    bytesToXml(*bytes, xml);
     return xml;
 }
 
@@ -282,6 +318,12 @@ void ZelMatFile::bytesToXml(const SharedBytes& bytes, const TextSink& sink) {
     if (writeXml(bytes, sink)) return;
     // Not a binary library: the file is taken to be XML text already.
     sink(text::decodeStoredText(text::upToFirstNul(bytes.view())));
+}
+
+void ZelMatFile::bytesToXml(const SharedBytes& bytes, std::string& document) {
+    resetSharedDefaultSun();
+    if (appendXml(bytes, document)) return;
+    document.append(text::decodeStoredText(text::upToFirstNul(bytes.view())));
 }
 
 std::string ZelMatFile::toXml(const MaterialPtr& material) { return materialToXml(material); }

@@ -78,6 +78,9 @@ public:
     void toXml(const std::filesystem::path& path, const TextSink& sink);
     // The same for the bytes of a file.
     void bytesToXml(const SharedBytes& bytes, const TextSink& sink);
+    // The same, appended to `document`. As nothing is sent before the whole text is
+    // there, a failing library can take its text back: each material is read once.
+    void bytesToXml(const SharedBytes& bytes, std::string& document);
 
     // Streams the XML document of the library in `bytes` to `sink`, one material's
     // "<Assets>" block at a time, holding one material in memory. The library is
@@ -86,6 +89,11 @@ public:
     // again, written and dropped. False, with lastReadFailure() set and nothing
     // sent, when the bytes do not read as a library. `materials` is left alone.
     bool writeXml(const SharedBytes& bytes, const TextSink& sink);
+
+    // Appends the XML document of the library in `bytes` to `document`, reading
+    // each material once. False, with lastReadFailure() set and `document` as it
+    // was, when the bytes do not read as a library.
+    bool appendXml(const SharedBytes& bytes, std::string& document);
 
     // Whether the bytes read as a library, each material dropped as soon as it has
     // read; on success the header is returned (its archive read through), otherwise
@@ -104,6 +112,8 @@ public:
     const std::optional<ReadFailure>& lastReadFailure() const { return lastReadFailure_; }
 
 private:
+    // readFraming(), with lastReadFailure_ saying why it failed.
+    std::optional<Framing> frame(const SharedBytes& bytes);
     // Reads the materials of a framed library one by one, handing each to `take`;
     // false, with lastReadFailure_ set, at the first that does not read.
     bool readMaterials(Framing& framing, const std::function<void(MaterialPtr&&)>& take);

@@ -1,5 +1,7 @@
 #include "platform/SharedBytes.hpp"
 
+#include "platform/HugePages.hpp"
+
 #include <boost/make_shared.hpp>
 
 #include <cstring>
@@ -10,19 +12,17 @@ namespace OrvexKavorCore {
 
 namespace {
 
-constexpr std::size_t kHugePage = std::size_t{2} << 20;
-
 // An anonymous mapping whose huge-page-aligned part the kernel is asked to back
 // with huge pages: one fault per 2 MiB instead of one per 4 KiB.
 class HugePageMapping {
 public:
-    explicit HugePageMapping(std::size_t size) : length_(size + kHugePage) {
+    explicit HugePageMapping(std::size_t size) : length_(size + kHugePageSize) {
         void* base = ::mmap(nullptr, length_, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
         if (base == MAP_FAILED) throw std::bad_alloc();
         base_ = static_cast<char*>(base);
         const auto address = reinterpret_cast<std::uintptr_t>(base_);
-        data_ = base_ + ((kHugePage - address % kHugePage) % kHugePage);
-        ::madvise(data_, size, MADV_HUGEPAGE); // only advice: without it, ordinary pages
+        data_ = base_ + ((kHugePageSize - address % kHugePageSize) % kHugePageSize);
+        adviseHugePages(data_, size);
     }
     ~HugePageMapping() { ::munmap(base_, length_); }
     HugePageMapping(const HugePageMapping&) = delete;
@@ -52,7 +52,7 @@ SharedBytes SharedBytes::adopt(std::string&& text) {
 }
 
 SharedBytes SharedBytes::allocate(std::size_t size, char*& data) {
-    if (size >= kHugePage) {
+    if (size >= kHugePageSize) {
         auto mapping = boost::make_shared<HugePageMapping>(size);
         data = mapping->data();
         return SharedBytes(std::move(mapping), std::string_view(data, size));

@@ -2,10 +2,26 @@
 // Text helpers. All text of the model is UTF-8 in std::string; these functions are
 // the edges where other encodings meet it.
 #include <cstddef>
+#include <cstdint>
+#include <cstring>
 #include <string>
 #include <string_view>
 
 namespace OrvexKavorCore::text {
+
+// Whether every byte is below 0x80, looked at eight bytes at a time.
+inline bool isAscii(std::string_view bytes) {
+    const char* p = bytes.data();
+    std::size_t n = bytes.size();
+    std::uint64_t seen = 0;
+    for (; n >= 8; p += 8, n -= 8) {
+        std::uint64_t word;
+        std::memcpy(&word, p, 8);
+        seen |= word;
+    }
+    for (; n > 0; ++p, --n) seen |= static_cast<unsigned char>(*p);
+    return (seen & 0x8080808080808080ull) == 0;
+}
 
 // True when the bytes are well-formed UTF-8: no overlong forms, no surrogates,
 // nothing above U+10FFFF, no truncated sequence.

@@ -4,6 +4,7 @@
 #include "materials/BaseMaterial.hpp"
 #include "options/BaseCamera.hpp"
 #include "params/TransformComponents.hpp"
+#include "platform/HugePages.hpp"
 #include "platform/Text.hpp"
 #include "textures/BaseBitmap.hpp"
 #include "textures/BaseTexture.hpp"
@@ -68,6 +69,7 @@ std::string escapeXml(std::string_view text) {
 // --- the pending text ---
 
 void AssetXmlWriter::flush() {
+    reserveForAppend(out_, pendingSize_);
     out_.append(pending_, pendingSize_);
     pendingSize_ = 0;
 }
@@ -79,7 +81,7 @@ void AssetXmlWriter::putLong(std::string_view text) {
 }
 
 void AssetXmlWriter::putNarrow(std::string_view narrow) {
-    if (isAsciiText(narrow)) return put(narrow);
+    if (text::isAscii(narrow)) return put(narrow);
     flush();
     text::appendLatin1AsUtf8(out_, narrow);
 }

@@ -1,11 +1,9 @@
 #pragma once
-// Copies and checks of a few bytes without a call into the C library: most of
-// what the asset writer copies is a tag, a name or a number of under 32 bytes,
-// where the call costs more than the copy.
+// Copies of a few bytes without a call into the C library: most of what the
+// asset writer copies is a tag, a name or a number of under 32 bytes, where the
+// call costs more than the copy.
 #include <cstddef>
-#include <cstdint>
 #include <cstring>
-#include <string_view>
 
 namespace OrvexKavorCore {
 
@@ -31,20 +29,6 @@ inline void copyShort(char* to, const char* from, std::size_t size) {
         to[size / 2] = from[size / 2];
         to[size - 1] = from[size - 1];
     }
-}
-
-// Whether every byte is below 0x80, eight bytes at a time.
-inline bool isAsciiText(std::string_view text) {
-    const char* p = text.data();
-    std::size_t n = text.size();
-    std::uint64_t seen = 0;
-    for (; n >= 8; p += 8, n -= 8) {
-        std::uint64_t word;
-        std::memcpy(&word, p, 8);
-        seen |= word;
-    }
-    for (; n > 0; ++p, --n) seen |= static_cast<unsigned char>(*p);
-    return (seen & 0x8080808080808080ull) == 0;
 }
 
 } // namespace OrvexKavorCore

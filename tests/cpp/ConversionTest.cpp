@@ -73,7 +73,11 @@ TEST_F(Conversions, StreamingSendsEachMaterialAndMatchesTheWholeDocument) {
     ASSERT_EQ(pieces.size(), 3u);
     for (const std::string& piece : pieces) EXPECT_TRUE(piece.starts_with("<Assets>")) << piece;
     EXPECT_EQ(pieces[0] + pieces[1] + pieces[2], expected);
+    // Converted whole, each material is read once: the skies' differing default
+    // suns send it back to the two readings.
     EXPECT_EQ(convertBytesToXml(FileKind::MaterialLibrary, bytes), expected);
+    const std::string sameSuns = libraryBytes({materialWithSky("first"), materialWithSky("second")});
+    EXPECT_EQ(convertBytesToXml(FileKind::MaterialLibrary, sameSuns), wholeDocument(sameSuns));
     EXPECT_EQ(convertBytesToXml(FileKind::MaterialLibrary, sample("sample.zelmat")),
               wholeDocument(sample("sample.zelmat")));
 }
@@ -88,6 +92,10 @@ TEST_F(Conversions, ALibraryFailingAtItsLastMaterialSendsNoMaterial) {
     file.bytesToXml(SharedBytes::copyOf(bytes),
                     [&](std::string_view piece) { pieces.emplace_back(piece); });
     EXPECT_EQ(pieces, std::vector<std::string>{""}); // the pass-through text: the header starts with a NUL
+    // Converted whole, the library's text is taken back before the pass-through text.
+    std::string document = "kept";
+    file.bytesToXml(SharedBytes::copyOf(bytes), document);
+    EXPECT_EQ(document, "kept");
     ASSERT_TRUE(file.lastReadFailure());
     EXPECT_EQ(file.lastReadFailure()->describe(),
               "material 1: unknown material kind 99 at offset " + std::to_string(12 + secondAt + 4));

@@ -116,6 +116,13 @@ def test_text_file_passes_through(tmp_path, call, data, text):
     assert type(result) is str and result == text
 
 
+@pytest.mark.parametrize("wide", ["", "é", "€", "🎨"], ids=["ascii", "latin1", "bmp", "astral"])
+def test_large_text_of_every_character_width(tmp_path, wide):
+    # Megabytes of text are made into a str another way than short ones.
+    text = ("<Assets name='x'/>\n" * 5 + wide + "ab" * 3 + wide) * 40_000
+    assert Dexmor.getZelmatXml(str(make(tmp_path, "big.zelmat", text.encode("utf-8")))) == text
+
+
 @pytest.mark.parametrize("call", CALLS)
 def test_unopenable_paths_give_empty_text(tmp_path, call):
     assert call(str(tmp_path / f"missing.{extension(call)}")) == ""
