@@ -27,6 +27,7 @@
 namespace {
 
 namespace core = OrvexKavorCore;
+namespace python = dexmor::python;
 
 // Dexmor.error. The module attribute holds one reference, this static another.
 PyObject* moduleError = nullptr;
@@ -155,7 +156,9 @@ void withoutInterpreterLock(Work&& work) {
     if (failure) std::rethrow_exception(failure);
 }
 
-PyObject* textObject(std::string_view text) { return dexmor::python::strFromUtf8(text); }
+PyObject* textObject(std::string_view text) {
+    return PyUnicode_DecodeUTF8(text.data(), static_cast<Py_ssize_t>(text.size()), "strict");
+}
 
 // The body of the conversion calls. C++ exceptions leave it only while the
 // interpreter lock is held.
@@ -168,10 +171,17 @@ PyObject* convertFile(PyObject* args, const Call& call) {
     constexpr std::size_t kKeptCapacity = std::size_t{64} << 20;
     thread_local std::string xml;
     xml.clear();
+    // Only making the str object needs the lock: the conversion, measuring the
+    // text and filling in the characters run while other threads do.
+    std::string_view text;
+    std::optional<python::StrShape> shape;
     withoutInterpreterLock([&] {
         core::appendXml(file->kind, std::filesystem::path(std::move(file->path)), xml);
+        text = core::text::upToFirstNul(xml);
+        shape = python::measureUtf8(text);
     });
-    PyObject* result = textObject(core::text::upToFirstNul(xml));
+    PyObject* result = shape ? python::newStr(*shape) : textObject(text);
+    if (result && shape) withoutInterpreterLock([&] { python::fillStr(result, text); });
     if (xml.capacity() > kKeptCapacity) std::string().swap(xml);
     return result;
 }

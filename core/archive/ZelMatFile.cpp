@@ -15,6 +15,7 @@
 #include <ios>
 #include <istream>
 #include <iterator>
+#include <new>
 #include <ostream>
 #include <sstream>
 
@@ -261,6 +262,22 @@ bool ZelMatFile::writeXml(const SharedBytes& bytes, const TextSink& sink) {
     });
 }
 
+namespace {
+
+// A library's document is some twenty times its size: room for that at once
+// spares the copies of growing step by step, and room never written costs no
+// memory. Only a hint: when the room cannot be had, the text grows as it goes.
+void reserveForDocument(std::string& document, std::size_t librarySize) {
+    constexpr std::size_t kExpectedGrowth = 24;
+    constexpr std::size_t kMostAtOnce = std::size_t{1} << 30;
+    try {
+        reserveForAppend(document, std::min(librarySize * kExpectedGrowth, kMostAtOnce));
+    } catch (const std::bad_alloc&) {
+    }
+}
+
+} // namespace
+
 bool ZelMatFile::appendXml(const SharedBytes& bytes, std::string& document) {
     const std::size_t start = document.size();
     const boost::shared_ptr<SunLight> defaultSun = sharedDefaultSun();
@@ -272,10 +289,7 @@ bool ZelMatFile::appendXml(const SharedBytes& bytes, std::string& document) {
     // is that one only if no later record changes it.
     boost::shared_ptr<SunLight> sunOfFirstBlock;
     bool sunChanged = false;
-    // A library's document is some twenty times its size: room for that at once
-    // spares the copies of growing step by step (room not written costs nothing).
-    constexpr std::size_t kExpectedGrowth = 24;
-    reserveForAppend(document, bytes.size() * kExpectedGrowth);
+    reserveForDocument(document, bytes.size());
     AssetXmlWriter writer(document);
     const bool read = readMaterials(*framing, [&](MaterialPtr&& material) {
         if (!sunOfFirstBlock)
