@@ -3,7 +3,11 @@
 // text), and the diagnosis that `dexmor check` reports for the same bytes.
 // Whatever the bytes, both must return without a crash, a leak, undefined
 // behaviour, a hang or memory out of proportion to the input, and must agree.
+// The conversion into one string reads each material once; streamed, it reads
+// the library twice: both must give the same text.
 #include "archive/Conversion.hpp"
+#include "archive/ZelMatFile.hpp"
+#include "textures/SkyTexture.hpp"
 
 #include <cstddef>
 #include <cstdint>
@@ -22,6 +26,15 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     if (!diagnosis.readsAsBinary && diagnosis.fallbackLength != xml.size()) {
         std::fprintf(stderr, "the diagnosis announces %zu bytes of pass-through text, the conversion gives %zu\n",
                      diagnosis.fallbackLength, xml.size());
+        std::abort();
+    }
+    std::string streamed;
+    resetSharedDefaultSun();
+    ZelMatFile().bytesToXml(SharedBytes::copyOf(bytes),
+                            [&streamed](std::string_view piece) { streamed.append(piece); });
+    if (streamed != xml) {
+        std::fprintf(stderr, "the streamed conversion differs from the whole one (%zu and %zu bytes)\n",
+                     streamed.size(), xml.size());
         std::abort();
     }
     return 0;
