@@ -82,6 +82,13 @@ record() { # NAME KEY VALUE...
     printf '%s\t%s\t%s\n' "$1" "$2" "${*:3}" >>"$results"
 }
 
+# Processor time from perf's task clock (microseconds) when perf can count it;
+# otherwise from /usr/bin/time, which rounds to 10 ms.
+cpu_clock=()
+if perf stat -x, -e task-clock true >/dev/null 2>&1; then
+    cpu_clock=(perf stat -x, -e task-clock -o "$out/cpu.log" --)
+fi
+
 # measure NAME RUNS COMMAND...: runs COMMAND (standard output to /dev/null) under
 # /usr/bin/time -v; records the wall time, the processor time and the peak
 # resident memory of each run.
@@ -92,7 +99,7 @@ measure() {
     for ((r = 0; r < count; r++)); do
         start=$EPOCHREALTIME
         status=0
-        /usr/bin/time -v -o "$log" "$@" >/dev/null 2>>"$out/stderr.log" || status=$?
+        "${cpu_clock[@]}" /usr/bin/time -v -o "$log" "$@" >/dev/null 2>>"$out/stderr.log" || status=$?
         end=$EPOCHREALTIME
         if ((status != 0)); then
             say "  $name: exit status $status (see $out/stderr.log)"
@@ -100,7 +107,11 @@ measure() {
             return 0
         fi
         times+=("$(awk -v a="$start" -v b="$end" 'BEGIN { printf "%.6f", b - a }')")
-        cpus+=("$(awk -F': ' '/User time|System time/ { s += $2 } END { printf "%.3f", s }' "$log")")
+        if ((${#cpu_clock[@]})); then
+            cpus+=("$(awk -F, '/task-clock/ { printf "%.6f", $1 / 1000 }' "$out/cpu.log")")
+        else
+            cpus+=("$(awk -F': ' '/User time|System time/ { s += $2 } END { printf "%.3f", s }' "$log")")
+        fi
         rss+=("$(awk -F': ' '/Maximum resident set size/ { print $2 }' "$log")")
     done
     record "$name" seconds "${times[@]}"
