@@ -11,6 +11,7 @@
 #include "textures/BaseUVW.hpp"
 #include "xml/NumberFormat.hpp"
 
+#include <array>
 #include <charconv>
 #include <cstring>
 #include <stdexcept>
@@ -22,17 +23,24 @@ namespace {
 // Indentation is copied from here, in pieces for deeper lines.
 constexpr std::string_view kSpaces = "                                                                ";
 
-// The entity replacing `c`, or nothing. Element text keeps its quotes and
-// apostrophes; attribute values and entries replace all five.
+// Which bytes an escaping replaces: all five of XML's predefined entities
+// (attribute values and entries), or only & < > (element text, which keeps its
+// quotes and apostrophes).
 template <bool kAllEntities>
+constexpr std::array<bool, 256> kNeedsEntity = [] {
+    std::array<bool, 256> needs{};
+    needs['&'] = needs['<'] = needs['>'] = true;
+    needs['"'] = needs['\''] = kAllEntities;
+    return needs;
+}();
+
 std::string_view entityFor(char c) {
     switch (c) {
     case '&': return "&amp;";
     case '<': return "&lt;";
     case '>': return "&gt;";
-    case '"': return kAllEntities ? "&quot;" : std::string_view();
-    case '\'': return kAllEntities ? "&apos;" : std::string_view();
-    default: return {};
+    case '"': return "&quot;";
+    default: return "&apos;";
     }
 }
 
@@ -43,10 +51,9 @@ template <bool kAllEntities, class Copy, class Entity>
 void splitAtEntities(std::string_view text, Copy copy, Entity entity) {
     std::size_t start = 0;
     for (std::size_t i = 0; i < text.size(); ++i) {
-        const std::string_view replacement = entityFor<kAllEntities>(text[i]);
-        if (replacement.empty()) continue;
+        if (!kNeedsEntity<kAllEntities>[static_cast<unsigned char>(text[i])]) continue;
         copy(text.substr(start, i - start));
-        entity(replacement);
+        entity(entityFor(text[i]));
         start = i + 1;
     }
     copy(text.substr(start));
@@ -175,14 +182,20 @@ void AssetXmlWriter::componentLines(const TransformComponents& c) {
 }
 
 void AssetXmlWriter::parameterStart(std::string_view name, std::string_view type, std::string_view label,
-                                    std::string_view listType, bool userData) {
+                                    std::string_view listType, bool userData, bool ownTypeWords) {
     indent();
     put("<parameter type=\"");
-    putNarrow(type);
+    if (ownTypeWords)
+        put(type);
+    else
+        putNarrow(type);
     put("\" name=\"");
     putNarrow(name);
     put("\" listType=\"");
-    putNarrow(listType);
+    if (ownTypeWords)
+        put(listType);
+    else
+        putNarrow(listType);
     put('"');
     if (userData) put(" isUserData=\"1\"");
     put(" label=\"");
@@ -317,7 +330,7 @@ void AssetXmlWriter::endParameters() {
 
 void AssetXmlWriter::beginParameter(std::string_view name, std::string_view type, std::string_view label,
                                     std::string_view listType, bool userData) {
-    parameterStart(name, type, label, listType, userData);
+    parameterStart(name, type, label, listType, userData, false);
     flush();
 }
 
@@ -516,7 +529,7 @@ void AssetXmlWriter::writePlugin(std::string_view name, const boost::any& object
 
 // "<list>" stands at the level of "<value>"; the entries one level deeper.
 void AssetXmlWriter::beginList(std::string_view name, std::string_view listType, std::string_view label) {
-    parameterStart(name, "list", label, listType, false);
+    parameterStart(name, "list", label, listType, false, false);
     line("<value>");
     line("<list>");
     ++depth_;

@@ -170,8 +170,9 @@ private:
     }
     void indentDeep();
     void line(std::string_view text); // indent, text, line feed
+    // `ownTypeWords`: the type and list type are the writer's own ASCII words.
     void parameterStart(std::string_view name, std::string_view type, std::string_view label,
-                        std::string_view listType, bool userData);
+                        std::string_view listType, bool userData, bool ownTypeWords = true);
     void parameterEnd();
     void inlineValueStart();
     void inlineValueEnd() { put("</value>\n"); }
