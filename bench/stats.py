@@ -254,6 +254,15 @@ def report(results):
                 rate = b.get("bytes_per_second")
                 print(f"  {b['name']:<34} {b['cpu_time']:>10.3f} {b['time_unit']:<3}"
                       f" {(f'{rate / MB:.0f} MB/s') if rate else '':>12}")
+            # The streamed conversion in one process: the time per material without
+            # the start of a process in it.
+            per_material = {int(b["name"].split("/")[1]): b["per_material"]
+                            for b in benchmarks if b["name"].startswith("BM_StreamLibrary/") and "per_material" in b}
+            if len(per_material) > 1:
+                small, large = min(per_material), max(per_material)
+                print(f"  {f'BM_StreamLibrary time per material, {large} / {small} materials':<62} "
+                      f"{per_material[large] / per_material[small]:.3g}x "
+                      f"({per_material[small] * 1e6:.1f} and {per_material[large] * 1e6:.1f} us)")
 
 
 def main(argv):
