@@ -282,79 +282,41 @@ TEST(LightRecord, RefusesBrokenPlacementsAndOverlongTexts) {
 
 // --- XML ---
 
+// A count beyond 2^31 - 1 shows as its signed value; a sun's asset stands at the
+// top of the document, whatever the path; the sphere light has none.
 TEST(LightXml, AssetsOfEveryKind) {
-    const std::string identity = "|transform transform " + kIdentity;
     OmniLight omni;
     omni.transform = Transform{Matrix{{{0, 1, 0}, {-1, 0, 0}, {0, 0, 2}}}, Vector{10, 20, 30}};
     omni.color = {0.5f, 0.25f, 1.0f}, omni.shadowBias = 0.125f, omni.decay = 2.0f, omni.shadowRadius = 0.75f;
-    omni.units = 3, omni.shadows = false, omni.affectSpecular = false;
-    omni.photonSubdivs = 4294967295u; // a count beyond 2^31 - 1 shows as its signed value
-    EXPECT_EQ(xmlOf(omni, "/Sky"),
-              assetXml("/Sky/LightOmni", "light", "LightOmni",
-                       "color color 0.5 0.25 1|color shadowColor 0 0 0|float cutoffThreshold 0.005|"
-                       "float shadowBias 0.125|float decay 2|float intensity 30|float shadowRadius 0.75|"
-                       "integer units 3|integer photonSubdivs -1|integer causticSubdivs 1000|"
-                       "integer shadowSubdivs 8|bool enabled 1|bool shadows 0|bool affectDiffuse 1|"
-                       "bool affectSpecular 0|transform transform 0 1 0 -1 0 0 0 0 2 10 20 30"));
+    omni.units = 3, omni.shadows = false, omni.affectSpecular = false, omni.photonSubdivs = 4294967295u;
+    expectGolden(xmlOf(omni, "/Sky"), "light_omni.xml");
 
     MayaDirectLight direct;
     direct.shadowBias = 0.5f, direct.shadowRadius = 1.5f, direct.shadows = false;
-    EXPECT_EQ(xmlOf(direct, "/Env"),
-              assetXml("/Env/MayaLightDirect", "light", "MayaLightDirect",
-                       "color color 1 1 1|color shadowColor 0 0 0|float shadowBias 0.5|float shadowRadius 1.5|"
-                       "integer causticSubdivs 1000|integer photonSubdivs 500|integer shadowSubdivs 8|"
-                       "bool enabled 1|bool shadows 0"));
+    expectGolden(xmlOf(direct, "/Env"), "light_direct.xml");
 
     SpotLight spot;
     spot.barnDoorLeft = 1, spot.barnDoorRight = 2, spot.barnDoorTop = 3, spot.barnDoorBottom = 4;
     spot.shadowBias = 0.25f, spot.decay = 0.5f, spot.shadowRadius = 0.75f, spot.penumbraAngle = 5, spot.units = 2;
     spot.barnDoor = true, spot.affectDiffuse = false;
-    EXPECT_EQ(xmlOf(spot, "/Sky"),
-              assetXml("/Sky/LightSpot", "light", "LightSpot",
-                       "color color 1 1 1|color shadowColor 0 0 0|float cutoffThreshold 0.005|"
-                       "float barnDoorLeft 1|float barnDoorRight 2|float barnDoorTop 3|float barnDoorBottom 4|"
-                       "float shadowBias 0.25|float decay 0.5|float intensity 50|float shadowRadius 0.75|"
-                       "float coneAngle 1|float penumbraAngle 5|integer units 2|integer photonSubdivs 500|"
-                       "integer causticSubdivs 1000|integer shadowSubdivs 8|bool enabled 1|bool barnDoor 1|"
-                       "bool shadows 1|bool affectDiffuse 0|bool affectSpecular 1" + identity));
+    expectGolden(xmlOf(spot, "/Sky"), "light_spot.xml");
 
     RectangleLight rect;
     rect.u_size = 2, rect.v_size = 3, rect.shadowBias = 0.25f;
     rect.doubleSided = true, rect.lightPortal = true, rect.affectReflections = false;
-    EXPECT_EQ(xmlOf(rect, "/Sky"),
-              assetXml("/Sky/LightRectangle", "light", "LightRectangle",
-                       "color color 1 1 1|color shadowColor 0 0 0|float cutoffThreshold 0.005|"
-                       "float shadowBias 0.25|float intensity 30|float u_size 2|float v_size 3|integer units 0|"
-                       "integer photonSubdivs 500|integer causticSubdivs 1000|integer subdivs 8|bool enabled 1|"
-                       "bool doubleSided 1|bool invisible 0|bool lightPortal 1|bool noDecay 0|"
-                       "bool storeWithIrradianceMap 0|bool ignoreLightNormals 1|bool shadows 1|"
-                       "bool affectDiffuse 1|bool affectSpecular 1|bool affectReflections 0" + identity));
+    expectGolden(xmlOf(rect, "/Sky"), "light_rectangle.xml");
 
     IESLight ies;
     ies.filter_color = {0.5f, 0.5f, 0.25f}, ies.photonSubdivs = 16, ies.soft_shadows = true;
     ies.ies_file = "C:\\lights\\a&b.ies";
-    EXPECT_EQ(xmlOf(ies, "/Sky"),
-              assetXml("/Sky/LightIES", "light", "LightIES",
-                       "transform transform " + kIdentity +
-                           "|color color 1 1 1|color shadowColor 0 0 0|color filter_color 0.5 0.5 0.25|"
-                           "float shadowBias 0|float cutoffThreshold 0.005|float intensity 1|"
-                           "integer photonSubdivs 16|integer causticSubdivs 1000|integer shadow_subdivs 8|"
-                           "bool enabled 1|bool shadows 1|bool soft_shadows 1|bool affectDiffuse 1|"
-                           "bool affectSpecular 1|string ies_file C:\\lights\\a&amp;b.ies"));
+    expectGolden(xmlOf(ies, "/Sky"), "light_ies.xml");
+
+    SunLight sun;
+    sun.shadowBias = 0.5f, sun.size_multiplier = 2, sun.shadows = false, sun.invisible = true;
+    expectGolden(xmlOf(sun, "/Oak/environment"), "light_sun.xml");
 
     SphereLight sphere;
     EXPECT_EQ(xmlOf(sphere, "/Sky"), "");
-
-    // A sun's asset stands at the top of the document, whatever the path.
-    SunLight sun;
-    sun.shadowBias = 0.5f, sun.size_multiplier = 2, sun.shadows = false, sun.invisible = true;
-    EXPECT_EQ(xmlOf(sun, "/Oak/environment"),
-              assetXml("/SunLight", "light", "SunLight",
-                       "vector up_vector 0 0 1|float shadowBias 0.5|float turbidity 3|float water_vapour 2|"
-                       "float intensity_multiplier 1|float size_multiplier 2|float photon_radius 50|"
-                       "float photon_emit_distance 150|float ozone 0.35|integer photonSubdivs 500|"
-                       "integer causticSubdivs 1000|integer shadow_subdivs 8|bool enabled 1|bool shadows 0|"
-                       "bool invisible 1"));
 }
 
 TEST(SunLightXml, OneAssetPerIdentifierNamedInWritingOrder) {

@@ -309,17 +309,7 @@ TEST(FrameData, OwnAssetGolden) {
     fd.ambient = Color{0.1f, 0.2f, 0.3f}, fd.kavorRefractBackground = Color{1, 0.5f, 0};
     fd.focal_dist = 123.0f; // shown by the options set's sections, not here
 
-    EXPECT_EQ(xmlOf(fd, "/scene"),
-              assetXml("/scene/FrameData", "settings", "FrameData",
-                       "float t 1.5|float frameStart 0|float frameEnd 250|integer currentFrame -3|"
-                       "transform worldToCam 1 0 0 0 1 0 0 0 1 1 2 3|"
-                       "transform camToWorld 0 0 -1 0 1 0 1 0 0 -1e+006 0.5 2.5e-007|float fov 0.785398|"
-                       "float nearRange 0|float farRange 0|integer clippingPlanes 1|float clipNear 0|"
-                       "float clipFar 1000|integer projType 0|float zoomFractor 1|integer infiniteProj 0|"
-                       "integer orthoAdjustToScene 0|color ambient 0.1 0.2 0.3|color background 0 0 0|"
-                       "color globalLightLevel 0 0 0|color kavorGIBackground 0 0 0|color kavorRRBackground 0 0 0|"
-                       "color kavorRefractBackground 1 0.5 0|float devAspect 1|integer fieldMask 2|"
-                       "integer fieldOrder 0|integer firstField 0"));
+    expectGolden(xmlOf(fd, "/scene"), "frame_data.xml");
 }
 
 // --- stamp info ---

@@ -1,8 +1,5 @@
 // The XML document of an options set: the twenty-one settings sections as golden
 // documents, and what single parameters show for chosen values.
-//
-// Set DEXMOR_UPDATE_GOLDEN=1 to rewrite the golden files from the current output
-// (then review the difference before keeping it).
 #include "TestSupport.hpp"
 
 #include "options/AllOptions.hpp"
@@ -10,8 +7,6 @@
 
 #include <gtest/gtest.h>
 
-#include <cstdlib>
-#include <fstream>
 #include <functional>
 #include <string>
 #include <tuple>
@@ -29,15 +24,6 @@ std::string documentOf(AllOptions& o, const std::string& path = "") {
     writer.endDocument();
     EXPECT_EQ(writer.depth(), 0u);
     return xml;
-}
-
-void expectGolden(const std::string& actual, const std::string& name) {
-    const std::string path = std::string(DEXMOR_SOURCE_DIR) + "/tests/golden/" + name;
-    if (std::getenv("DEXMOR_UPDATE_GOLDEN")) std::ofstream(path, std::ios::binary) << actual;
-    std::ifstream in(path, std::ios::binary);
-    ASSERT_TRUE(in) << path;
-    const std::string expected{std::istreambuf_iterator<char>(in), {}};
-    EXPECT_EQ(actual, expected) << name;
 }
 
 // Parameter `name` of the asset at `url`, its lines without indentation, joined.

@@ -246,46 +246,24 @@ TEST_F(Sky, CopiesGetNewIdentifiersAndComparisonIgnoresTheirCase) {
 
 // --- XML ---
 
-namespace {
-
-std::string sunAsset(const std::string& url) {
-    return assetXml(url, "light", "SunLight",
-                    "vector up_vector 0 0 1|float shadowBias 0|float turbidity 3|float water_vapour 2|"
-                    "float intensity_multiplier 1|float size_multiplier 1|float photon_radius 50|"
-                    "float photon_emit_distance 150|float ozone 0.35|integer photonSubdivs 500|"
-                    "integer causticSubdivs 1000|integer shadow_subdivs 8|bool enabled 1|bool shadows 1|"
-                    "bool invisible 0");
-}
-
-std::string skyAsset(const std::string& url, const std::string& sunUrl) {
-    return assetXml(url, "texture", "TexSky", "plugin sun " + sunUrl);
-}
-
-} // namespace
-
-TEST_F(SkyXml, SkyWithItsSun) {
+// A sky writes its sun's asset (at the top of the document) before its own; one
+// sun asset per identifier in a document, the next one named "/SunLight1".
+TEST_F(SkyXml, SkyWithItsSunAndOneSunAssetPerIdentifier) {
     SkyTexture sky;
-    EXPECT_EQ(xmlOf(sky, "/Sky/environment"),
-              sunAsset("/SunLight") + skyAsset("/Sky/environment", "/SunLight"));
-
     SkyTexture bare;
     bare.sun.reset();
-    EXPECT_EQ(xmlOf(bare, "/Sky/environment"), skyAsset("/Sky/environment", ""));
-}
+    expectGolden(xmlOf(sky, "/Sky/environment") + xmlOf(bare, "/Sky/environment"), "sky_with_and_without_sun.xml");
 
-TEST_F(SkyXml, OneSunAssetPerIdentifierInADocument) {
     SkyTexture first;
     first.sun = boost::make_shared<SunLight>("Noon", "{0A0B}");
     SkyTexture second; // another object with the same identifier
     second.sun = boost::make_shared<SunLight>("Noon again", "{0A0B}");
     SkyTexture third;
     third.sun = boost::make_shared<SunLight>("Dusk", "{0C0D}");
-
     std::string out;
     AssetXmlWriter writer(out);
     first.writeXml(writer, "/a/sky");
     second.writeXml(writer, "/b/sky");
     third.writeXml(writer, "/c/sky");
-    EXPECT_EQ(out, sunAsset("/SunLight") + skyAsset("/a/sky", "/SunLight") + skyAsset("/b/sky", "/SunLight") +
-                       sunAsset("/SunLight1") + skyAsset("/c/sky", "/SunLight1"));
+    expectGolden(out, "sky_suns_by_identifier.xml");
 }

@@ -1,7 +1,7 @@
 #pragma once
 // Helpers shared by the record tests: byte images assembled by hand, the record an
 // object writes, reading records back, a check that every stored byte takes part in
-// comparison, and the exact text of XML assets written from a short description.
+// comparison, and golden documents.
 #include "archive/QuickArchive.hpp"
 #include "params/AnimatedValues.hpp"
 #include "xml/AssetXmlWriter.hpp"
@@ -11,7 +11,10 @@
 #include <bit>
 #include <cmath>
 #include <cstdint>
+#include <cstdlib>
+#include <fstream>
 #include <initializer_list>
+#include <iterator>
 #include <random>
 #include <string>
 #include <string_view>
@@ -114,6 +117,18 @@ std::string xmlOf(Object& object, const std::string& url) {
     return out;
 }
 
+// Compares `actual` with the file tests/golden/`name`. With DEXMOR_UPDATE_GOLDEN=1
+// in the environment the file is rewritten from `actual` first (review the
+// difference before keeping it).
+inline void expectGolden(const std::string& actual, const std::string& name) {
+    const std::string path = std::string(DEXMOR_SOURCE_DIR) + "/tests/golden/" + name;
+    if (std::getenv("DEXMOR_UPDATE_GOLDEN")) std::ofstream(path, std::ios::binary) << actual;
+    std::ifstream in(path, std::ios::binary);
+    ASSERT_TRUE(in) << path;
+    const std::string expected{std::istreambuf_iterator<char>(in), {}};
+    EXPECT_EQ(actual, expected) << name;
+}
+
 inline std::size_t occurrences(const std::string& text, const std::string& what) {
     std::size_t n = 0;
     for (auto at = text.find(what); at != std::string::npos; at = text.find(what, at + 1)) ++n;
@@ -156,70 +171,6 @@ inline std::string randomText(std::mt19937& rng, unsigned maxPieces = 12) {
     std::string s;
     for (unsigned i = 0, n = 1 + rng() % maxPieces; i < n; ++i) s += pieces[rng() % std::size(pieces)];
     return s;
-}
-
-// --- the exact text of assets ---
-
-inline const std::string kIdentity = "1 0 0 0 1 0 0 0 1 0 0 0";       // a transform's numbers
-inline const std::string kDefaultComponents = "0 0 0 1 1 1 0 0 0 0 0 0"; // a component block's
-
-namespace detail {
-inline std::string_view cut(std::string_view& text, char at) {
-    const auto end = text.find(at);
-    const std::string_view head = text.substr(0, end);
-    text = end == std::string_view::npos ? std::string_view{} : text.substr(end + 1);
-    return head;
-}
-inline std::string line(int depth, const std::string& text) {
-    return std::string(2 * static_cast<std::size_t>(depth), ' ') + text + "\n";
-}
-inline std::string element(std::string_view name, std::string_view value) {
-    return "<" + std::string(name) + ">" + std::string(value) + "</" + std::string(name) + ">";
-}
-inline std::string vectorLines(std::string_view& numbers) {
-    std::string s = line(7, "<vector>");
-    for (const char* c : {"x", "y", "z"}) s += line(8, element(c, cut(numbers, ' ')));
-    return s + line(7, "</vector>");
-}
-} // namespace detail
-
-// One parameter from "type name value". A colour's, vector's or transform's value
-// is its numbers separated by spaces (a transform: the three columns, then the
-// offset), a component block's its twelve numbers; a plugin reference without a
-// value has no value line; any other value runs to the end of the description.
-inline std::string parameterXml(std::string_view shape) {
-    using detail::cut, detail::line;
-    const std::string type(cut(shape, ' ')), name(cut(shape, ' '));
-    const std::string start =
-        line(5, "<parameter type=\"" + type + "\" name=\"" + name + "\" listType=\"none\" label=\"" + name + "\">");
-    std::string body;
-    if (type == "color" || type == "acolor") {
-        for (const char* c : {"r", "g", "b", "a"})
-            if (*c != 'a' || type == "acolor") body += line(7, detail::element(c, cut(shape, ' ')));
-    } else if (type == "vector" || type == "transform") {
-        for (int i = type == "vector" ? 3 : 0; i < 4; ++i) body += detail::vectorLines(shape);
-    } else if (type == "componentTransform" || type == "componentMatrix") {
-        for (const char* c : {"x_rotation", "y_rotation", "z_rotation", "x_scale", "y_scale", "z_scale", "x_offset",
-                              "y_offset", "z_offset", "x_mirror", "y_mirror", "z_mirror"})
-            body += line(7, detail::element(c, cut(shape, ' ')));
-    } else {
-        const bool noValue = type == "plugin" && shape.empty();
-        return start + (noValue ? "" : line(6, detail::element("value", shape))) + line(5, "</parameter>");
-    }
-    return start + line(6, "<value>") + body + line(6, "</value>") + line(5, "</parameter>");
-}
-
-// One asset at the first level of a document; `params` lists parameter
-// descriptions (see parameterXml) separated by '|'.
-inline std::string assetXml(const std::string& url, const std::string& type, const std::string& plugin,
-                            std::string_view params, const std::string& layout = "") {
-    using detail::line;
-    std::string s = line(1, "<Asset layout=\"" + layout + "\" renderer=\"kavor\" type=\"" + type + "\" url=\"" + url +
-                                "\" >") +
-                    line(2, "<plugin>") + line(3, "<kavorplugin name=\"" + plugin + "\" type=\"" + type + "\">") +
-                    line(4, "<parameters>");
-    while (!params.empty()) s += parameterXml(detail::cut(params, '|'));
-    return s + line(4, "</parameters>") + line(3, "</kavorplugin>") + line(2, "</plugin>") + line(1, "</Asset>");
 }
 
 } // namespace testsupport

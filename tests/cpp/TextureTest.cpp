@@ -419,61 +419,27 @@ TEST(Texture, DeepTreesBuiltInMemoryStopAtTheLimit) {
 
 // --- XML ---
 
-namespace {
-std::string colorAsset(const std::string& url, const std::string& rgba) {
-    return assetXml(url, "texture", "TexAColor", "acolor texture " + rgba);
-}
-const std::string kPlanarWorld = "componentTransform uvw_transform " + kDefaultComponents;
-} // namespace
-
-TEST(TextureXml, CheckerWithItsChildren) {
+// The checker's children (generator, two colours) come first, in field order; the
+// bitmap texture's generator and buffer likewise; a Fresnel texture always writes
+// "old_way", its white texture as the child "refraction_tex".
+TEST(TextureXml, CheckerBitmapAndFresnel) {
     CheckerTexture checker;
     checker.tile_v = false;
-    const std::string url = "/Oak/diffuse_tex";
-    EXPECT_EQ(xmlOf(checker, url),
-              assetXml(url + "/uvwgen", "uvw", "UVWGenPlanarWorld", kPlanarWorld) +
-                  colorAsset(url + "/white_color", "1 1 1 1") + colorAsset(url + "/black_color", "0 0 0 1") +
-                  assetXml(url, "texture", "TexChecker",
-                           "plugin uvwgen /Oak/diffuse_tex/uvwgen/UVWGenPlanarWorld|"
-                           "plugin white_color /Oak/diffuse_tex/white_color/TexAColor|"
-                           "plugin black_color /Oak/diffuse_tex/black_color/TexAColor|bool tile_u 1|bool tile_v 0"));
-
+    expectGolden(xmlOf(checker, "/Oak/diffuse_tex"), "texture_checker.xml");
     // References carry the escaped child url.
     EXPECT_NE(xmlOf(checker, "/Oak & \"Ash\"").find("<value>/Oak &amp; &quot;Ash&quot;/white_color/TexAColor</value>"),
               std::string::npos);
-}
 
-TEST(TextureXml, BitmapTextureWithGeneratorAndBuffer) {
     const TexturePtr made = makeBitmapTexture("maps/oak <old>.png");
-    auto& bitmap = static_cast<BitmapTexture&>(*made);
-    bitmap.tile = false;
-    const std::string url = "/Oak/diffuse_tex";
-    // The two children, in field order, under their child names, then the texture.
-    const std::string expected =
-        xmlOf(*bitmap.uvwgen, url + "/uvwgen") + xmlOf(*bitmap.bitmap, url + "/buffer") +
-        assetXml(url, "texture", "TexBitmap",
-                 "plugin uvwgen " + url + "/uvwgen/UVWGenChannel|plugin bitmap " + url +
-                     "/buffer/BitmapBuffer|bool tile 0");
-    EXPECT_EQ(xmlOf(bitmap, url), expected);
-    EXPECT_NE(expected.find("maps/oak &lt;old&gt;.png"), std::string::npos);
-}
+    static_cast<BitmapTexture&>(*made).tile = false;
+    expectGolden(xmlOf(*made, "/Oak/diffuse_tex"), "texture_bitmap.xml");
 
-TEST(TextureXml, FresnelAlwaysOldWay) {
     FresnelTexture fresnel;
     fresnel.white_color_tex = boost::make_shared<AColorTexture>(AColor{0.5f, 0.25f, 0.125f, 1});
-    const std::string url = "/Glass/reflect";
-    EXPECT_EQ(xmlOf(fresnel, url),
-              colorAsset(url + "/refraction_tex", "0.5 0.25 0.125 1") +
-                  assetXml(url, "texture", "TexFresnel",
-                           "color white_color 1 1 1|color black_color 0.254902 0.254902 0.254902|"
-                           "float fresnel_ior 1.55|float refract_ior 1.55|float black_color_tex_mult 1|"
-                           "float white_color_tex_mult 1|float fresnel_ior_tex_mult 1|float refract_ior_tex_mult 1|"
-                           "plugin black_color_tex|plugin white_color_tex " + url + "/refraction_tex/TexAColor|"
-                           "plugin fresnel_ior_tex|plugin refract_ior_tex|bool old_way 1"));
-
+    expectGolden(xmlOf(fresnel, "/Glass/reflect"), "texture_fresnel.xml");
     // The reflection texture is the child "reflection_tex".
     fresnel.black_color_tex = boost::make_shared<AColorTexture>();
-    EXPECT_NE(xmlOf(fresnel, url).find("url=\"/Glass/reflect/reflection_tex\""), std::string::npos);
+    EXPECT_NE(xmlOf(fresnel, "/Glass/reflect").find("url=\"/Glass/reflect/reflection_tex\""), std::string::npos);
 }
 
 TEST(TextureXml, ParameterOrderOfTheOtherKinds) {
@@ -507,18 +473,15 @@ TEST(TextureXml, ParameterOrderOfTheOtherKinds) {
     }
 }
 
+// A cloth's tile flag gives both tile_u and tile_v; an invert texture writes its
+// texture as the child "base_texture", first.
 TEST(TextureXml, ClothTileGivesBothFlagsAndInvertNamesItsBase) {
     ClothTexture cloth;
     cloth.tile = false;
-    const std::string xml = xmlOf(cloth, "/c");
-    EXPECT_NE(xml.find(parameterXml("bool tile_u 0") + parameterXml("bool tile_v 0")), std::string::npos);
-    EXPECT_NE(xml.find(parameterXml("plugin uvwgen")), std::string::npos);
-
+    expectGolden(xmlOf(cloth, "/c"), "texture_cloth.xml");
     InvertTexture invert;
     invert.texture = boost::make_shared<AColorTexture>();
-    const std::string inverted = xmlOf(invert, "/i");
-    EXPECT_EQ(inverted.find("url=\"/i/base_texture\""), inverted.find("url=\""));
-    EXPECT_NE(inverted.find(parameterXml("plugin texture /i/base_texture/TexAColor")), std::string::npos);
+    expectGolden(xmlOf(invert, "/i"), "texture_invert.xml");
 }
 
 // --- colour inversion ---

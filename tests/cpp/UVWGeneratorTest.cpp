@@ -165,42 +165,30 @@ TEST(UVWGenerator, RefusedVersionsFailAndOnlyTheObjectGeneratorResets) {
 
 // --- XML ---
 
-TEST(UVWGeneratorXml, ProjectionKindsRebuildTheirTransform) {
-    const std::string components = "componentTransform uvw_transform " + kDefaultComponents;
+// The projection kinds and the environment rebuild their transform or matrix from
+// the components; the environment's mapping type outside 0..3 gives an empty name.
+TEST(UVWGeneratorXml, AssetsRebuiltFromTheComponents) {
     GenPlanarWorldUVW planar;
-    EXPECT_EQ(xmlOf(planar, "/Oak/uvwgen"), assetXml("/Oak/uvwgen", "uvw", "UVWGenPlanarWorld", components));
     GenObjectUVW object;
     object.uvwTransform = Transform::zero();
-    EXPECT_EQ(xmlOf(object, "/Oak/uvwgen"), assetXml("/Oak/uvwgen", "uvw", "UVWGenObject", components));
-    EXPECT_TRUE(object.uvwTransform == Transform::identity()); // rebuilt from the components
-}
+    expectGolden(xmlOf(planar, "/Oak/uvwgen") + xmlOf(object, "/Oak/uvwgen"), "uvw_projection.xml");
+    EXPECT_TRUE(object.uvwTransform == Transform::identity());
 
-TEST(UVWGeneratorXml, EnvironmentMappingNames) {
-    const std::pair<std::int32_t, const char*> cases[] = {
-        {0, "angular"}, {1, "cubic"}, {2, "spherical"}, {3, "mirror_ball"}, {4, ""}, {-1, ""}, {INT_MIN, ""}};
-    for (const auto& [type, name] : cases) {
+    std::string mappings;
+    for (const std::int32_t type : {0, 1, 2, 3, 4, -1, INT_MIN}) {
         GenEnvironmentUVW environment;
         environment.mappingType = type;
         environment.uvwMatrix = Matrix::zero();
-        EXPECT_EQ(xmlOf(environment, "/e"),
-                  assetXml("/e", "uvw", "UVWGenEnvironment",
-                           "componentMatrix uvw_matrix " + kDefaultComponents + "|string mapping_type " + name))
-            << type;
-        EXPECT_TRUE(environment.uvwMatrix == Matrix::identity()); // rebuilt from the components
+        mappings += xmlOf(environment, "/e");
+        EXPECT_TRUE(environment.uvwMatrix == Matrix::identity()) << type;
     }
-    GenEnvironmentUVW byDefault;
-    EXPECT_NE(xmlOf(byDefault, "/e").find(parameterXml("string mapping_type spherical")), std::string::npos);
-}
+    GenEnvironmentUVW byDefault; // spherical
+    expectGolden(mappings + xmlOf(byDefault, "/e"), "uvw_environment_mapping_types.xml");
 
-TEST(UVWGeneratorXml, ChannelTexTransformComesFromItsComponents) {
+    // The rotation about x by 90 degrees; cos of the 32-bit angle is -4.37114e-08.
     GenChannelUVW channel;
     channel.texTransform = Transform{Matrix{{{7, 7, 7}, {7, 7, 7}, {7, 7, 7}}}, Vector{7, 7, 7}};
     channel.texComponents.x_rotation = 90, channel.texComponents.z_offset = 2.5f;
     channel.wrap_u = 1, channel.uvw_channel = 3;
-    // The rotation about x by 90 degrees; cos of the 32-bit angle is -4.37114e-08.
-    EXPECT_EQ(xmlOf(channel, "/c"),
-              assetXml("/c", "uvw", "UVWGenChannel",
-                       "componentTransform uvw_transform " + kDefaultComponents +
-                           "|transform tex_transform 1 0 0 0 -4.37114e-008 1 0 -1 -4.37114e-008 0 0 2.5"
-                           "|integer wrap_u 1|integer wrap_v 0|integer uvw_channel 3"));
+    expectGolden(xmlOf(channel, "/c"), "uvw_channel.xml");
 }

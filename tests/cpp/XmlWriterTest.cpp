@@ -2,6 +2,8 @@
 // of references between assets and of lists, and the escaping rules.
 #include "xml/AssetXmlWriter.hpp"
 
+#include "TestSupport.hpp"
+
 #include "lights/BaseLight.hpp"
 #include "materials/BaseMaterial.hpp"
 #include "options/BaseCamera.hpp"
@@ -85,26 +87,12 @@ TEST(XmlWriter, DocumentsOfMaterialsAndSections) {
         w.endAsset();
         w.endDocument();
     };
-    const std::string document =
-        "<Assets>\n"
-        "  <Asset layout=\"defkvmat\" renderer=\"kavor\" type=\"material\" url=\"/Oak\" >\n"
-        "    <plugin>\n"
-        "      <kavorplugin name=\"MtlSingleBRDF\" type=\"material\">\n"
-        "        <parameters>\n"
-        "          <parameter type=\"integer\" name=\"double_sided\" listType=\"none\" label=\"double_sided\">\n"
-        "            <value>1</value>\n"
-        "          </parameter>\n"
-        "        </parameters>\n"
-        "      </kavorplugin>\n"
-        "    </plugin>\n"
-        "  </Asset>\n"
-        "</Assets>\n";
     // Two materials give two documents, one after the other.
-    EXPECT_EQ(written([&](AssetXmlWriter& w) {
-                  material(w);
-                  material(w);
-              }),
-              document + document);
+    testsupport::expectGolden(written([&](AssetXmlWriter& w) {
+                                  material(w);
+                                  material(w);
+                              }),
+                              "xml_writer_two_documents.xml");
 
     // A section's "Assets" element is never indented; its assets stand one level deeper.
     EXPECT_EQ(written([](AssetXmlWriter& w) {
