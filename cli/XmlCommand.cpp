@@ -165,16 +165,25 @@ private:
     bool ended_ = false;
 };
 
-// Converts one FILE into its target under -o. The message is empty on success.
+// Converts one FILE into its target under -o, counting the bytes written. The
+// message is empty on success.
 std::string convertToFile(const Job& job, std::uint64_t& bytesWritten) {
     core::AtomicFileWriter output(job.target);
     UpToFirstNul cut;
+    bytesWritten = 0;
     try {
-        core::convertToXml(job.kind, job.file, [&](std::string_view piece) {
+        // The document goes to a temporary file, so a library can be read once:
+        // what it sent before failing is dropped, and the pass-through text follows.
+        const auto send = [&](std::string_view piece) {
             cut.pass(piece, [&](std::string_view text) {
                 output.append(text);
                 bytesWritten += text.size();
             });
+        };
+        core::convertToXml(job.kind, job.file, send, [&] {
+            output.discard();
+            cut = UpToFirstNul();
+            bytesWritten = 0;
         });
     } catch (const std::bad_alloc&) {
         return std::string(job.name) + ": conversion failed: out of memory";

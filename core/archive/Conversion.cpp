@@ -35,6 +35,12 @@ void convertToXml(FileKind kind, const std::filesystem::path& path, const TextSi
         ZelOptFile().toXml(path, sink);
 }
 
+void convertToXml(FileKind kind, const std::filesystem::path& path, const TextSink& sink,
+                  const std::function<void()>& takeBack) {
+    if (kind == FileKind::RenderOptions) return convertToXml(kind, path, sink); // sends only a whole document
+    if (const std::optional<SharedBytes> bytes = readRegularFile(path)) ZelMatFile().bytesToXml(*bytes, sink, takeBack);
+}
+
 void appendXml(FileKind kind, const std::filesystem::path& path, std::string& document) {
     if (kind == FileKind::RenderOptions)
         return convertToXml(kind, path, [&document](std::string_view piece) { document.append(piece); });

@@ -6,6 +6,7 @@
 
 #include <cstddef>
 #include <filesystem>
+#include <functional>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -35,6 +36,11 @@ std::string convertToXml(FileKind kind, const std::filesystem::path& path);
 // The same, streamed: a material library is sent one material's block at a time
 // and never held whole (the file's bytes are, once).
 void convertToXml(FileKind kind, const std::filesystem::path& path, const TextSink& sink);
+// The same, streamed to a destination that can drop what it was sent (a file
+// not yet in place): a material library is read once. `takeBack` is called when
+// the text sent so far must go; the whole text then follows.
+void convertToXml(FileKind kind, const std::filesystem::path& path, const TextSink& sink,
+                  const std::function<void()>& takeBack);
 // The same, appended to `document`. The text is whole before anyone sees it, so a
 // material library is read once, not twice as when streamed.
 void appendXml(FileKind kind, const std::filesystem::path& path, std::string& document);

@@ -276,33 +276,64 @@ void reserveForDocument(std::string& document, std::size_t librarySize) {
     }
 }
 
+// Sky records write into the shared default sun, and every sky that uses it
+// shows the state the last record leaves it in. A material written as soon as it
+// has read shows the state of its moment instead, which is the last one only if
+// no later record changes it: this notes whether one does.
+class DefaultSunWatch {
+public:
+    // Called after each material has read; true once the state differs from the
+    // one after the first material.
+    bool changedAfterReading() {
+        if (!first_)
+            first_ = boost::make_shared<SunLight>(*sharedDefaultSun());
+        else if (!changed_)
+            changed_ = !sharedDefaultSun()->isEqual(first_);
+        return changed_;
+    }
+    bool changed() const { return changed_; }
+
+private:
+    boost::shared_ptr<SunLight> first_;
+    bool changed_ = false;
+};
+
 } // namespace
 
 bool ZelMatFile::appendXml(const SharedBytes& bytes, std::string& document) {
     const std::size_t start = document.size();
-    const boost::shared_ptr<SunLight> defaultSun = sharedDefaultSun();
-    const SunLight pristineSun = *defaultSun;
+    const SunLight pristineSun = *sharedDefaultSun();
     std::optional<Framing> framing = frame(bytes);
     if (!framing) return false;
-    // Every sky that uses the default sun shows the state the last sky record
-    // leaves it in. The blocks written here show the state of their moment, which
-    // is that one only if no later record changes it.
-    boost::shared_ptr<SunLight> sunOfFirstBlock;
-    bool sunChanged = false;
     reserveForDocument(document, bytes.size());
     AssetXmlWriter writer(document);
+    DefaultSunWatch sunWatch;
     const bool read = readMaterials(*framing, [&](MaterialPtr&& material) {
-        if (!sunOfFirstBlock)
-            sunOfFirstBlock = boost::make_shared<SunLight>(*defaultSun);
-        else if (!sunChanged)
-            sunChanged = !defaultSun->isEqual(sunOfFirstBlock);
+        if (sunWatch.changedAfterReading()) return; // the text is read again below
         writeMaterialAssets(writer, material);
     });
-    if (read && !sunChanged) return true;
+    if (read && !sunWatch.changed()) return true;
     document.resize(start);
     if (!read) return false;
-    *defaultSun = pristineSun;
+    *sharedDefaultSun() = pristineSun;
     return writeXml(bytes, [&document](std::string_view piece) { document.append(piece); });
+}
+
+ZelMatFile::SingleReading ZelMatFile::writeXmlReadingOnce(const SharedBytes& bytes, const TextSink& sink) {
+    std::optional<Framing> framing = frame(bytes);
+    if (!framing) return SingleReading::NotALibrary;
+    std::string block;
+    AssetXmlWriter writer(block);
+    DefaultSunWatch sunWatch;
+    const bool read = readMaterials(*framing, [&](MaterialPtr&& material) {
+        if (sunWatch.changedAfterReading()) return;
+        block.clear();
+        writeMaterialAssets(writer, material);
+        material.reset(); // a deep tree goes before its text is sent on
+        sink(block);
+    });
+    if (!read) return SingleReading::NotALibrary;
+    return sunWatch.changed() ? SingleReading::SunChanged : SingleReading::Written;
 }
 
 std::string ZelMatFile::toXml(const std::filesystem::path& path) {
@@ -338,6 +369,20 @@ void ZelMatFile::bytesToXml(const SharedBytes& bytes, std::string& document) {
     resetSharedDefaultSun();
     if (appendXml(bytes, document)) return;
     document.append(text::decodeStoredText(text::upToFirstNul(bytes.view())));
+}
+
+void ZelMatFile::bytesToXml(const SharedBytes& bytes, const TextSink& sink, const std::function<void()>& takeBack) {
+    resetSharedDefaultSun();
+    switch (writeXmlReadingOnce(bytes, sink)) {
+    case SingleReading::Written: return;
+    case SingleReading::SunChanged:
+        takeBack();
+        resetSharedDefaultSun();
+        if (writeXml(bytes, sink)) return; // sends nothing when it fails
+        break;
+    case SingleReading::NotALibrary: takeBack(); break;
+    }
+    sink(text::decodeStoredText(text::upToFirstNul(bytes.view())));
 }
 
 std::string ZelMatFile::toXml(const MaterialPtr& material) { return materialToXml(material); }

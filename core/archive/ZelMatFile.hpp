@@ -81,6 +81,11 @@ public:
     // The same, appended to `document`. As nothing is sent before the whole text is
     // there, a failing library can take its text back: each material is read once.
     void bytesToXml(const SharedBytes& bytes, std::string& document);
+    // The same, streamed to a destination that can drop what it was sent (a
+    // temporary file): each material is read once. `takeBack` is called when the
+    // text sent so far must go, because the bytes do not read as a library or a
+    // later sky record changed the default sun; the whole text then follows.
+    void bytesToXml(const SharedBytes& bytes, const TextSink& sink, const std::function<void()>& takeBack);
 
     // Streams the XML document of the library in `bytes` to `sink`, one material's
     // "<Assets>" block at a time, holding one material in memory. The library is
@@ -94,6 +99,16 @@ public:
     // each material once. False, with lastReadFailure() set and `document` as it
     // was, when the bytes do not read as a library.
     bool appendXml(const SharedBytes& bytes, std::string& document);
+
+    // How a single reading of a library ended.
+    enum class SingleReading {
+        Written,     // the whole document was sent
+        NotALibrary, // the bytes do not read as a library (lastReadFailure() says why)
+        SunChanged,  // a sky record after the first material changed the default sun
+    };
+    // Streams the document to `sink` reading each material once; unless Written,
+    // what was sent must be dropped.
+    SingleReading writeXmlReadingOnce(const SharedBytes& bytes, const TextSink& sink);
 
     // Whether the bytes read as a library, each material dropped as soon as it has
     // read; on success the header is returned (its archive read through), otherwise

@@ -84,6 +84,14 @@ bool AtomicFileWriter::append(std::string_view data) {
     return flush();
 }
 
+bool AtomicFileWriter::discard() {
+    if (!error_.empty()) return false;
+    buffer_.clear();
+    if (::ftruncate(fd_, 0) != 0 || ::lseek(fd_, 0, SEEK_SET) != 0)
+        return failWith("cannot empty " + temporary_);
+    return true;
+}
+
 bool AtomicFileWriter::flush() {
     std::string_view rest = buffer_;
     while (!rest.empty()) {

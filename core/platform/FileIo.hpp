@@ -27,6 +27,9 @@ public:
 
     // Buffers and writes `data`; false once anything has failed (later calls do nothing).
     bool append(std::string_view data);
+    // Drops everything appended so far: the file starts again empty. False once
+    // anything has failed.
+    bool discard();
     // Writes what is buffered, syncs, closes and renames. False, with `error` (when
     // given) saying why, on any failure along the way or an earlier one.
     bool commit(std::string* error = nullptr);

@@ -46,6 +46,20 @@ std::string wholeDocument(const std::string& bytes) {
     return xml;
 }
 
+// The text a destination that drops what it was sent on request ends up with.
+std::string readOnceIntoFile(const std::string& bytes, int* takenBack = nullptr) {
+    std::string file;
+    int drops = 0;
+    ZelMatFile().bytesToXml(
+        SharedBytes::copyOf(bytes), [&file](std::string_view piece) { file.append(piece); },
+        [&] {
+            file.clear();
+            ++drops;
+        });
+    if (takenBack) *takenBack = drops;
+    return file;
+}
+
 std::string sample(const char* name) {
     std::ifstream in(std::string(DEXMOR_SOURCE_DIR) + "/examples/" + name, std::ios::binary);
     return std::string(std::istreambuf_iterator<char>(in), {});
@@ -73,11 +87,17 @@ TEST_F(Conversions, StreamingSendsEachMaterialAndMatchesTheWholeDocument) {
     ASSERT_EQ(pieces.size(), 3u);
     for (const std::string& piece : pieces) EXPECT_TRUE(piece.starts_with("<Assets>")) << piece;
     EXPECT_EQ(pieces[0] + pieces[1] + pieces[2], expected);
-    // Converted whole, each material is read once: the skies' differing default
-    // suns send it back to the two readings.
+    // Converted whole, or into a destination that can drop what it was sent, each
+    // material is read once: the skies' differing default suns send it back to
+    // the two readings.
     EXPECT_EQ(convertBytesToXml(FileKind::MaterialLibrary, bytes), expected);
+    int takenBack = 0;
+    EXPECT_EQ(readOnceIntoFile(bytes, &takenBack), expected);
+    EXPECT_EQ(takenBack, 1);
     const std::string sameSuns = libraryBytes({materialWithSky("first"), materialWithSky("second")});
     EXPECT_EQ(convertBytesToXml(FileKind::MaterialLibrary, sameSuns), wholeDocument(sameSuns));
+    EXPECT_EQ(readOnceIntoFile(sameSuns, &takenBack), wholeDocument(sameSuns));
+    EXPECT_EQ(takenBack, 0);
     EXPECT_EQ(convertBytesToXml(FileKind::MaterialLibrary, sample("sample.zelmat")),
               wholeDocument(sample("sample.zelmat")));
 }
@@ -92,10 +112,14 @@ TEST_F(Conversions, ALibraryFailingAtItsLastMaterialSendsNoMaterial) {
     file.bytesToXml(SharedBytes::copyOf(bytes),
                     [&](std::string_view piece) { pieces.emplace_back(piece); });
     EXPECT_EQ(pieces, std::vector<std::string>{""}); // the pass-through text: the header starts with a NUL
-    // Converted whole, the library's text is taken back before the pass-through text.
+    // Converted whole, or into a destination that can drop what it was sent, the
+    // library's text is taken back before the pass-through text.
     std::string document = "kept";
     file.bytesToXml(SharedBytes::copyOf(bytes), document);
     EXPECT_EQ(document, "kept");
+    int takenBack = 0;
+    EXPECT_EQ(readOnceIntoFile(bytes, &takenBack), "");
+    EXPECT_EQ(takenBack, 1); // the first material had been sent
     ASSERT_TRUE(file.lastReadFailure());
     EXPECT_EQ(file.lastReadFailure()->describe(),
               "material 1: unknown material kind 99 at offset " + std::to_string(12 + secondAt + 4));

@@ -143,6 +143,22 @@ def test_parallel_jobs_write_the_same_documents(tmp_path):
     assert outputs["1"]["f1.zelopt.xml"].decode() == module_text(inputs[1])
 
 
+def test_output_files_match_standard_output_for_damaged_libraries(tmp_path):
+    # Into -o a library is read once and what it wrote is dropped if a later
+    # record fails; on standard output it is read twice and nothing is sent early.
+    sample = (SOURCE_DIR / "examples" / "sample.zelmat").read_bytes()
+    inputs = []
+    for i, at in enumerate(range(len(sample) // 3, len(sample), len(sample) // 9)):
+        damaged = bytearray(sample)
+        damaged[at] ^= 0x5A
+        inputs.append(tmp_path / f"d{i}.zelmat")
+        inputs[-1].write_bytes(bytes(damaged))
+    run = dexmor("xml", "-o", tmp_path / "out", *inputs)
+    assert (run.returncode, run.stderr) == (0, b"")
+    for path in inputs:
+        assert (tmp_path / "out" / (path.name + ".xml")).read_bytes() == dexmor("xml", path).stdout
+
+
 @pytest.mark.parametrize("jobs", ["0", "x", "-1", "2000"])
 def test_bad_job_counts_are_usage_errors(tmp_path, jobs):
     run = dexmor("xml", "-o", tmp_path / "out", "-j", jobs, "a.zelmat", cwd=tmp_path)
