@@ -210,12 +210,8 @@ void ZelMatFile::names(std::vector<std::string>& out) const {
 }
 
 bool ZelMatFile::load(const std::filesystem::path& path) {
-    const std::optional<SharedBytes> bytes = readRegularFile(path);
-    if (!bytes) {
-        lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
-        return false;
-    }
-    return readFromBytes(*bytes);
+    const std::optional<SharedBytes> bytes = readFile(path);
+    return bytes && readFromBytes(*bytes);
 }
 
 bool ZelMatFile::save(const std::filesystem::path& path) {
@@ -303,57 +299,45 @@ private:
 bool ZelMatFile::appendXml(const SharedBytes& bytes, std::string& document) {
     const std::size_t start = document.size();
     const SunLight pristineSun = *sharedDefaultSun();
-    std::optional<Framing> framing = frame(bytes);
-    if (!framing) return false;
     reserveForDocument(document, bytes.size());
-    AssetXmlWriter writer(document);
-    DefaultSunWatch sunWatch;
-    const bool read = readMaterials(*framing, [&](MaterialPtr&& material) {
-        if (sunWatch.changedAfterReading()) return; // the text is read again below
-        writeMaterialAssets(writer, material);
-    });
-    if (read && !sunWatch.changed()) return true;
+    const SingleReading reading = writeXmlReadingOnce(bytes, document, {});
+    if (reading == SingleReading::Written) return true;
     document.resize(start);
-    if (!read) return false;
+    if (reading == SingleReading::NotALibrary) return false;
     *sharedDefaultSun() = pristineSun;
     return writeXml(bytes, [&document](std::string_view piece) { document.append(piece); });
 }
 
-ZelMatFile::SingleReading ZelMatFile::writeXmlReadingOnce(const SharedBytes& bytes, const TextSink& sink) {
+ZelMatFile::SingleReading ZelMatFile::writeXmlReadingOnce(const SharedBytes& bytes, std::string& text,
+                                                          const std::function<void()>& blockWritten) {
     std::optional<Framing> framing = frame(bytes);
     if (!framing) return SingleReading::NotALibrary;
-    std::string block;
-    AssetXmlWriter writer(block);
+    AssetXmlWriter writer(text);
     DefaultSunWatch sunWatch;
     const bool read = readMaterials(*framing, [&](MaterialPtr&& material) {
-        if (sunWatch.changedAfterReading()) return;
-        block.clear();
+        if (sunWatch.changedAfterReading()) return; // the text is written again by the two readings
         writeMaterialAssets(writer, material);
         material.reset(); // a deep tree goes before its text is sent on
-        sink(block);
+        if (blockWritten) blockWritten();
     });
     if (!read) return SingleReading::NotALibrary;
     return sunWatch.changed() ? SingleReading::SunChanged : SingleReading::Written;
 }
 
+std::optional<SharedBytes> ZelMatFile::readFile(const std::filesystem::path& path) {
+    std::optional<SharedBytes> bytes = readRegularFile(path);
+    if (!bytes) lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
+    return bytes;
+}
+
 std::string ZelMatFile::toXml(const std::filesystem::path& path) {
     std::string xml;
-    const std::optional<SharedBytes> bytes = readRegularFile(path);
-    if (!bytes) {
-        lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
-        return xml;
-    }
-    bytesToXml(*bytes, xml);
+    if (const std::optional<SharedBytes> bytes = readFile(path)) bytesToXml(*bytes, xml);
     return xml;
 }
 
 void ZelMatFile::toXml(const std::filesystem::path& path, const TextSink& sink) {
-    const std::optional<SharedBytes> bytes = readRegularFile(path);
-    if (!bytes) {
-        lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
-        return;
-    }
-    bytesToXml(*bytes, sink);
+    if (const std::optional<SharedBytes> bytes = readFile(path)) bytesToXml(*bytes, sink);
 }
 
 void ZelMatFile::bytesToXml(const SharedBytes& bytes, const TextSink& sink) {
@@ -373,7 +357,12 @@ void ZelMatFile::bytesToXml(const SharedBytes& bytes, std::string& document) {
 
 void ZelMatFile::bytesToXml(const SharedBytes& bytes, const TextSink& sink, const std::function<void()>& takeBack) {
     resetSharedDefaultSun();
-    switch (writeXmlReadingOnce(bytes, sink)) {
+    std::string block;
+    const auto sendBlock = [&] {
+        sink(block);
+        block.clear();
+    };
+    switch (writeXmlReadingOnce(bytes, block, sendBlock)) {
     case SingleReading::Written: return;
     case SingleReading::SunChanged:
         takeBack();

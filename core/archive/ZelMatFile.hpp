@@ -100,16 +100,6 @@ public:
     // was, when the bytes do not read as a library.
     bool appendXml(const SharedBytes& bytes, std::string& document);
 
-    // How a single reading of a library ended.
-    enum class SingleReading {
-        Written,     // the whole document was sent
-        NotALibrary, // the bytes do not read as a library (lastReadFailure() says why)
-        SunChanged,  // a sky record after the first material changed the default sun
-    };
-    // Streams the document to `sink` reading each material once; unless Written,
-    // what was sent must be dropped.
-    SingleReading writeXmlReadingOnce(const SharedBytes& bytes, const TextSink& sink);
-
     // Whether the bytes read as a library, each material dropped as soon as it has
     // read; on success the header is returned (its archive read through), otherwise
     // lastReadFailure() says why. `materials` is left alone.
@@ -127,6 +117,19 @@ public:
     const std::optional<ReadFailure>& lastReadFailure() const { return lastReadFailure_; }
 
 private:
+    // How a single reading of a library ended.
+    enum class SingleReading {
+        Written,     // the whole document was written
+        NotALibrary, // the bytes do not read as a library (lastReadFailure_ says why)
+        SunChanged,  // a sky record after the first material changed the default sun
+    };
+    // Writes the document to `text` reading each material once, calling
+    // `blockWritten` (when given) after each material's block; unless Written,
+    // what was written must be dropped.
+    SingleReading writeXmlReadingOnce(const SharedBytes& bytes, std::string& text,
+                                      const std::function<void()>& blockWritten);
+    // readRegularFile(), with lastReadFailure_ saying when it cannot be opened.
+    std::optional<SharedBytes> readFile(const std::filesystem::path& path);
     // readFraming(), with lastReadFailure_ saying why it failed.
     std::optional<Framing> frame(const SharedBytes& bytes);
     // Reads the materials of a framed library one by one, handing each to `take`;

@@ -183,19 +183,14 @@ void AssetXmlWriter::componentLines(const TransformComponents& c) {
 
 void AssetXmlWriter::parameterStart(std::string_view name, std::string_view type, std::string_view label,
                                     std::string_view listType, bool userData, bool ownTypeWords) {
+    const auto putTypeWord = [&](std::string_view word) { ownTypeWords ? put(word) : putNarrow(word); };
     indent();
     put("<parameter type=\"");
-    if (ownTypeWords)
-        put(type);
-    else
-        putNarrow(type);
+    putTypeWord(type);
     put("\" name=\"");
     putNarrow(name);
     put("\" listType=\"");
-    if (ownTypeWords)
-        put(listType);
-    else
-        putNarrow(listType);
+    putTypeWord(listType);
     put('"');
     if (userData) put(" isUserData=\"1\"");
     put(" label=\"");
