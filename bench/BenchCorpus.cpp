@@ -2,8 +2,8 @@
 
 #include "SampleBuilders.hpp"
 
-#include "archive/QuickArchive.hpp"
-#include "textures/UVWGenerators.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/textures/UVWGenerators.hpp>
 
 #include <array>
 #include <cmath>

@@ -9,8 +9,8 @@
 // seed gives the same objects, and so the same XML, on every machine (the
 // materials' identifiers, random UUIDs, are the only bytes that differ between two
 // runs, and the XML does not show them).
-#include "archive/ZelMatFile.hpp"
-#include "options/AllOptions.hpp"
+#include <dexmor/files/ZelMatFile.hpp>
+#include <dexmor/options/AllOptions.hpp>
 
 #include <cstddef>
 #include <cstdint>

@@ -2,9 +2,9 @@
 // from bytes to XML, for a material library and a render-options file.
 #include "BenchCorpus.hpp"
 
-#include "archive/Conversion.hpp"
-#include "archive/ZelMatFile.hpp"
-#include "archive/ZelOptFile.hpp"
+#include <dexmor/dexmor.hpp>
+#include <dexmor/files/ZelMatFile.hpp>
+#include <dexmor/files/ZelOptFile.hpp>
 
 #include <benchmark/benchmark.h>
 
@@ -53,7 +53,9 @@ BENCHMARK(BM_ReadLibrary)->Unit(benchmark::kMillisecond);
 void convert(benchmark::State& state, FileKind kind, const std::string& bytes) {
     std::size_t made = 0;
     for (auto _ : state) {
-        const std::string xml = convertBytesToXml(kind, bytes);
+        std::string xml;
+        StringSink sink(xml);
+        OrvexKavorCore::convert(kind, Input::ofBytes(bytes), sink);
         made += xml.size();
         benchmark::DoNotOptimize(xml.data());
     }
@@ -79,8 +81,8 @@ void BM_StreamLibrary(benchmark::State& state) {
         found = libraries.emplace(materials, SharedBytes::adopt(bench::libraryBytes(library))).first;
     }
     std::size_t made = 0;
-    for (auto _ : state)
-        ZelMatFile().bytesToXml(found->second, [&made](std::string_view piece) { made += piece.size(); });
+    CallbackSink counted([&made](std::string_view piece) { made += piece.size(); });
+    for (auto _ : state) OrvexKavorCore::convert(FileKind::MaterialLibrary, Input::ofBytes(found->second.view()), counted);
     state.SetBytesProcessed(static_cast<std::int64_t>(made));
     state.counters["per_material"] = benchmark::Counter(double(state.iterations() * materials),
                                                         benchmark::Counter::kIsRate | benchmark::Counter::kInvert);

@@ -1,5 +1,5 @@
 // Throughput of the asset document writer and of float formatting.
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/xml/AssetXmlWriter.hpp>
 #include "xml/NumberFormat.hpp"
 
 #include <benchmark/benchmark.h>

@@ -7,7 +7,7 @@
 // what was made, so that a caller can tell a finished set from an interrupted one.
 #include "BenchCorpus.hpp"
 
-#include "archive/ZelOptFile.hpp"
+#include <dexmor/files/ZelOptFile.hpp>
 #include "platform/FileIo.hpp"
 
 #include <charconv>

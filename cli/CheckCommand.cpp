@@ -5,8 +5,9 @@
 // instead.
 #include "Commands.hpp"
 
-#include "archive/Conversion.hpp"
+#include <dexmor/dexmor.hpp>
 
+#include <filesystem>
 #include <optional>
 #include <string>
 #include <vector>
@@ -57,7 +58,7 @@ int runCheck(Args args) {
             rejected = true;
             continue;
         }
-        const core::Diagnosis diagnosis = core::diagnose(*kind, std::string(name));
+        const core::Diagnosis diagnosis = core::diagnose(*kind, std::filesystem::path(std::string(name)));
         allBinary = allBinary && diagnosis.readsAsBinary;
         if (!out.write(lineOf(name, diagnosis))) {
             outputGone = true;

@@ -7,8 +7,7 @@
 #include "Commands.hpp"
 #include "Progress.hpp"
 
-#include "archive/Conversion.hpp"
-#include "platform/FileIo.hpp"
+#include <dexmor/dexmor.hpp>
 
 #include <algorithm>
 #include <atomic>
@@ -149,42 +148,38 @@ std::vector<Job> jobsOf(const std::vector<std::string_view>& files, bool& reject
 }
 
 // Sends a document on up to its first NUL, as the Python module's text ends there.
-class UpToFirstNul {
+class UpToFirstNul final : public core::DocumentSink {
 public:
-    template <class Next>
-    void pass(std::string_view piece, Next&& next) {
+    explicit UpToFirstNul(core::DocumentSink& next) : next_(next) {}
+    void write(std::string_view piece) override {
         if (ended_) return;
         if (const auto nul = piece.find('\0'); nul != std::string_view::npos) {
             piece = piece.substr(0, nul);
             ended_ = true;
         }
-        if (!piece.empty()) next(piece);
+        if (!piece.empty()) next_.write(piece);
+    }
+    bool canTakeBack() const override { return next_.canTakeBack(); }
+    void takeBack() override {
+        next_.takeBack();
+        ended_ = false;
     }
 
 private:
+    core::DocumentSink& next_;
     bool ended_ = false;
 };
 
 // Converts one FILE into its target under -o, counting the bytes written. The
 // message is empty on success.
 std::string convertToFile(const Job& job, std::uint64_t& bytesWritten) {
-    core::AtomicFileWriter output(job.target);
-    UpToFirstNul cut;
+    // The document goes to a temporary file, so a library can be read once: what
+    // it sent before failing is taken back, and the pass-through text follows.
+    core::AtomicFileSink output(job.target);
     bytesWritten = 0;
     try {
-        // The document goes to a temporary file, so a library can be read once:
-        // what it sent before failing is dropped, and the pass-through text follows.
-        const auto send = [&](std::string_view piece) {
-            cut.pass(piece, [&](std::string_view text) {
-                output.append(text);
-                bytesWritten += text.size();
-            });
-        };
-        core::convertToXml(job.kind, job.file, send, [&] {
-            output.discard();
-            cut = UpToFirstNul();
-            bytesWritten = 0;
-        });
+        UpToFirstNul cut(output);
+        core::convert(job.kind, job.file, cut);
     } catch (const std::bad_alloc&) {
         return std::string(job.name) + ": conversion failed: out of memory";
     } catch (const std::exception& error) {
@@ -192,6 +187,7 @@ std::string convertToFile(const Job& job, std::uint64_t& bytesWritten) {
     }
     std::string error;
     if (!output.commit(&error)) return error;
+    bytesWritten = output.bytesWritten();
     return {};
 }
 
@@ -281,13 +277,14 @@ bool writeAllToStandardOutput(const std::vector<Job>& jobs) {
             pending.clear();
         }
     };
+    core::CallbackSink toOutput([&](std::string_view piece) {
+        if (!outputGone) send(piece);
+    });
     bool ok = true;
     for (const Job& job : jobs) {
-        UpToFirstNul cut;
+        UpToFirstNul cut(toOutput);
         try {
-            core::convertToXml(job.kind, job.file, [&](std::string_view piece) {
-                if (!outputGone) cut.pass(piece, send);
-            });
+            core::convert(job.kind, job.file, cut);
         } catch (const std::exception& error) {
             complain({job.name, ": conversion failed: ", error.what()});
             ok = false;

@@ -5,6 +5,8 @@
 // conversion logic of its own; it calls the core's conversion and diagnosis.
 #include "Commands.hpp"
 
+#include <dexmor/version.hpp>
+
 #include <exception>
 #include <new>
 #include <string_view>
@@ -83,7 +85,7 @@ int run(Args args) {
     if (args.empty()) return usageError({"no command given"});
     const std::string_view first = args.front();
     if (first == "-h" || first == "--help") return showText(helpText);
-    if (first == "--version") return showText("dexmor " DEXMOR_VERSION "\n");
+    if (first == "--version") return showText("dexmor " DEXMOR_VERSION_STRING "\n");
     for (const Command& command : commands)
         if (command.name == first) return command.run(args.subspan(1));
     if (first.starts_with('-')) return usageError({"unknown option '", first, "'"});

@@ -1,6 +1,7 @@
 # What `cmake --install` puts under the prefix, every destination relative to it
 # so that `cmake --install <build> --prefix <dir>` relocates the whole tree:
-#   include/dexmor/...                 the headers of core/, in their subdirectories
+#   include/dexmor/...                 the public headers (cmake/DexmorPublicHeaders.cmake)
+#                                      and the generated version.hpp
 #   lib/libdexmor_core.a               the library
 #   lib/cmake/Dexmor/                  find_package(Dexmor CONFIG) with the target Dexmor::core
 #   lib/pkgconfig/dexmor.pc            for pkg-config
@@ -11,7 +12,6 @@ include(CMakePackageConfigHelpers)
 
 set(DEXMOR_INSTALL_CMAKEDIR "${CMAKE_INSTALL_LIBDIR}/cmake/Dexmor" CACHE STRING
     "Where the CMake package files go, relative to the prefix")
-set(DEXMOR_INSTALL_INCLUDEDIR "${CMAKE_INSTALL_INCLUDEDIR}/dexmor")
 
 # A library built with the sanitizers needs their runtimes in every program that
 # links it, so a sanitized build hands its link flags on to its consumers.
@@ -22,12 +22,18 @@ endif()
 
 # ---- the library and its headers ---------------------------------------------
 set_target_properties(dexmor_core PROPERTIES EXPORT_NAME core)
-target_include_directories(dexmor_core INTERFACE $<INSTALL_INTERFACE:${DEXMOR_INSTALL_INCLUDEDIR}>)
+# Consumers get <prefix>/include and write #include <dexmor/...>.
+target_include_directories(dexmor_core INTERFACE $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
 target_link_options(dexmor_core INTERFACE $<INSTALL_INTERFACE:${DEXMOR_CONSUMER_LINK_OPTIONS}>)
 install(TARGETS dexmor_core EXPORT DexmorTargets
         ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT Development)
-install(DIRECTORY ${PROJECT_SOURCE_DIR}/core/ DESTINATION ${DEXMOR_INSTALL_INCLUDEDIR}
-        COMPONENT Development FILES_MATCHING PATTERN "*.hpp")
+foreach(header IN LISTS DEXMOR_PUBLIC_HEADERS)
+  get_filename_component(folder "${header}" DIRECTORY)
+  install(FILES ${PROJECT_SOURCE_DIR}/include/dexmor/${header}
+          DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/dexmor/${folder} COMPONENT Development)
+endforeach()
+install(FILES ${PROJECT_BINARY_DIR}/include/dexmor/version.hpp
+        DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/dexmor COMPONENT Development)
 
 # ---- CMake package -------------------------------------------------------------
 install(EXPORT DexmorTargets NAMESPACE Dexmor:: DESTINATION ${DEXMOR_INSTALL_CMAKEDIR}
@@ -53,7 +59,7 @@ install(FILES ${PROJECT_BINARY_DIR}/package/dexmor.pc
 
 # ---- the tool and its manual page --------------------------------------------------
 install(TARGETS dexmor RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT Runtime)
-install(FILES ${PROJECT_SOURCE_DIR}/docs/dexmor.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT Runtime)
+install(FILES ${PROJECT_BINARY_DIR}/docs/dexmor.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT Runtime)
 
 # ---- the Python module --------------------------------------------------------------
 if(TARGET Dexmor)

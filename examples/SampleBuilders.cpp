@@ -1,6 +1,6 @@
 #include "SampleBuilders.hpp"
 
-#include "textures/UVWGenerators.hpp"
+#include <dexmor/textures/UVWGenerators.hpp>
 
 #include <utility>
 

@@ -2,10 +2,10 @@
 // Small builders of materials, textures and options with our own model classes,
 // shared by the program that makes the sample files of this folder and by the
 // generator of the benchmark files (bench/).
-#include "brdfs/BRDFs.hpp"
-#include "materials/Materials.hpp"
-#include "options/AllOptions.hpp"
-#include "textures/Textures.hpp"
+#include <dexmor/brdfs/BRDFs.hpp>
+#include <dexmor/materials/Materials.hpp>
+#include <dexmor/options/AllOptions.hpp>
+#include <dexmor/textures/Textures.hpp>
 
 #include <boost/make_shared.hpp>
 

@@ -7,8 +7,8 @@
 // lit by a sky and a bitmap.
 #include "SampleBuilders.hpp"
 
-#include "archive/ZelMatFile.hpp"
-#include "archive/ZelOptFile.hpp"
+#include <dexmor/files/ZelMatFile.hpp>
+#include <dexmor/files/ZelOptFile.hpp>
 
 #include <cstdio>
 #include <filesystem>

@@ -10,10 +10,11 @@
 // Equality is only required of objects that equal themselves: a NaN stored in a
 // float field is unequal to itself, and two instance materials are never equal.
 // Their round trip is still checked byte for byte.
-#include "archive/ZelMatFile.hpp"
-#include "archive/ZelOptFile.hpp"
-#include "options/AllOptions.hpp"
-#include "textures/SkyTexture.hpp"
+#include <dexmor/files/ConversionContext.hpp>
+#include <dexmor/files/ZelMatFile.hpp>
+#include <dexmor/files/ZelOptFile.hpp>
+#include <dexmor/options/AllOptions.hpp>
+#include <dexmor/textures/SkyTexture.hpp>
 
 #include <algorithm>
 #include <cstddef>
@@ -70,12 +71,12 @@ long firstUnequalMaterial(const std::vector<MaterialPtr>& a, const std::vector<M
 }
 
 void roundTripLibrary(std::string_view bytes) {
-    resetSharedDefaultSun();
+    const ConversionContext fresh1;
     ZelMatFile first;
     if (!first.readFromBytes(bytes)) return;
     const std::string written = writeLibrary(first, "first");
 
-    resetSharedDefaultSun();
+    const ConversionContext fresh2;
     ZelMatFile second;
     if (!second.readFromBytes(written))
         fault("material library: the written bytes do not read: " + failureText(second.lastReadFailure()));
@@ -100,13 +101,13 @@ std::string writeOptions(AllOptions& options, const char* which) {
 }
 
 void roundTripOptions(std::string_view bytes) {
-    resetSharedDefaultSun();
+    const ConversionContext fresh3;
     ZelOptFile file;
     AllOptions first;
     if (!file.readBytes(first, bytes)) return;
     const std::string written = writeOptions(first, "first");
 
-    resetSharedDefaultSun();
+    const ConversionContext fresh4;
     AllOptions second;
     if (!file.readBytes(second, written))
         fault("render options: the written bytes do not read: " + failureText(file.lastReadFailure()));

@@ -6,9 +6,7 @@
 // The conversion into one string, or into a destination that can drop what it
 // was sent, reads each material once; streamed, it reads the library twice: all
 // must give the same text.
-#include "archive/Conversion.hpp"
-#include "archive/ZelMatFile.hpp"
-#include "textures/SkyTexture.hpp"
+#include <dexmor/dexmor.hpp>
 
 #include <cstddef>
 #include <cstdint>
@@ -19,29 +17,36 @@
 
 using namespace OrvexKavorCore;
 
+namespace {
+
+// The document as a destination that can take back what it was sent gets it
+// (the library read once), or as one that cannot (read twice).
+std::string converted(std::string_view bytes, bool canTakeBack) {
+    std::string xml;
+    StringSink whole(xml);
+    CallbackSink streamed([&xml](std::string_view piece) { xml.append(piece); });
+    DocumentSink& sink = canTakeBack ? static_cast<DocumentSink&>(whole) : streamed;
+    convert(FileKind::MaterialLibrary, Input::ofBytes(bytes), sink);
+    return xml;
+}
+
+} // namespace
+
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     const std::string_view bytes(reinterpret_cast<const char*>(data), size);
-    const std::string xml = convertBytesToXml(FileKind::MaterialLibrary, bytes);
-    const Diagnosis diagnosis = diagnoseBytes(FileKind::MaterialLibrary, bytes);
+    const std::string xml = converted(bytes, true);
+    const Diagnosis diagnosis = diagnose(FileKind::MaterialLibrary, Input::ofBytes(bytes));
     // The diagnosis tells what the conversion returns instead of XML, to the byte.
     if (!diagnosis.readsAsBinary && diagnosis.fallbackLength != xml.size()) {
         std::fprintf(stderr, "the diagnosis announces %zu bytes of pass-through text, the conversion gives %zu\n",
                      diagnosis.fallbackLength, xml.size());
         std::abort();
     }
-    std::string streamed;
-    resetSharedDefaultSun();
-    ZelMatFile().bytesToXml(SharedBytes::copyOf(bytes),
-                            [&streamed](std::string_view piece) { streamed.append(piece); });
-    // Into a destination that drops what it was sent on request, as the tool's
-    // temporary files do, the library is read once too.
-    std::string dropping;
-    ZelMatFile().bytesToXml(
-        SharedBytes::copyOf(bytes), [&dropping](std::string_view piece) { dropping.append(piece); },
-        [&dropping] { dropping.clear(); });
-    if (streamed != xml || dropping != xml) {
-        std::fprintf(stderr, "the conversions differ: whole %zu, streamed %zu, taken back %zu bytes\n", xml.size(),
-                     streamed.size(), dropping.size());
+    // Read once or twice, the document is the same to the byte.
+    const std::string streamed = converted(bytes, false);
+    if (streamed != xml) {
+        std::fprintf(stderr, "the conversions differ: read once %zu, read twice %zu bytes\n", xml.size(),
+                     streamed.size());
         std::abort();
     }
     return 0;

@@ -3,7 +3,7 @@
 // text), and the diagnosis that `dexmor check` reports for the same bytes.
 // Whatever the bytes, both must return without a crash, a leak, undefined
 // behaviour, a hang or memory out of proportion to the input, and must agree.
-#include "archive/Conversion.hpp"
+#include <dexmor/dexmor.hpp>
 
 #include <cstddef>
 #include <cstdint>
@@ -16,8 +16,10 @@ using namespace OrvexKavorCore;
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     const std::string_view bytes(reinterpret_cast<const char*>(data), size);
-    const std::string xml = convertBytesToXml(FileKind::RenderOptions, bytes);
-    const Diagnosis diagnosis = diagnoseBytes(FileKind::RenderOptions, bytes);
+    std::string xml;
+    StringSink sink(xml);
+    convert(FileKind::RenderOptions, Input::ofBytes(bytes), sink);
+    const Diagnosis diagnosis = diagnose(FileKind::RenderOptions, Input::ofBytes(bytes));
     // The diagnosis tells what the conversion returns instead of XML, to the byte.
     if (!diagnosis.readsAsBinary && diagnosis.fallbackLength != xml.size()) {
         std::fprintf(stderr, "the diagnosis announces %zu bytes of pass-through text, the conversion gives %zu\n",

@@ -10,15 +10,16 @@
 //            and the sample in every options version the reader accepts.
 // Every file is read back before it is kept; a form that does not read is left out.
 // The checked-in corpora are these files after libFuzzer's -merge=1.
-#include "archive/Record.hpp"
-#include "archive/ZelMatFile.hpp"
-#include "archive/ZelOptFile.hpp"
-#include "brdfs/BRDFs.hpp"
-#include "materials/Materials.hpp"
-#include "options/AllOptions.hpp"
-#include "textures/SkyTexture.hpp"
-#include "textures/Textures.hpp"
-#include "textures/UVWGenerators.hpp"
+#include <dexmor/files/ConversionContext.hpp>
+#include <dexmor/archive/Record.hpp>
+#include <dexmor/files/ZelMatFile.hpp>
+#include <dexmor/files/ZelOptFile.hpp>
+#include <dexmor/brdfs/BRDFs.hpp>
+#include <dexmor/materials/Materials.hpp>
+#include <dexmor/options/AllOptions.hpp>
+#include <dexmor/textures/SkyTexture.hpp>
+#include <dexmor/textures/Textures.hpp>
+#include <dexmor/textures/UVWGenerators.hpp>
 
 #include <boost/make_shared.hpp>
 
@@ -70,7 +71,7 @@ std::string generation2(const std::vector<MaterialPtr>& materials) {
 
 void keepLibrary(const std::string& name, const std::vector<MaterialPtr>& materials) {
     const std::string bytes = generation2(materials);
-    resetSharedDefaultSun();
+    const ConversionContext fresh1;
     if (bytes.empty() || !ZelMatFile().readFromBytes(bytes)) {
         std::fprintf(stderr, "left out: %s\n", name.c_str());
         return;
@@ -173,7 +174,7 @@ std::string optionsBytes(AllOptions& options, std::uint16_t version) {
 
 void keepOptions(const std::string& name, const std::string& bytes) {
     AllOptions check;
-    resetSharedDefaultSun();
+    const ConversionContext fresh2;
     if (bytes.empty() || !ZelOptFile().readBytes(check, bytes)) {
         std::fprintf(stderr, "left out: %s\n", name.c_str());
         return;

@@ -12,8 +12,8 @@
 #include <Python.h>
 
 #include "PythonText.hpp"
-#include "archive/Conversion.hpp"
-#include "platform/Text.hpp"
+#include <dexmor/dexmor.hpp>
+#include <dexmor/platform/Text.hpp>
 
 #include <cstring>
 #include <exception>
@@ -176,7 +176,8 @@ PyObject* convertFile(PyObject* args, const Call& call) {
     std::string_view text;
     std::optional<python::StrShape> shape;
     withoutInterpreterLock([&] {
-        core::appendXml(file->kind, std::filesystem::path(std::move(file->path)), xml);
+        core::StringSink sink(xml);
+        core::convert(file->kind, std::filesystem::path(std::move(file->path)), sink);
         text = core::text::upToFirstNul(xml);
         shape = python::measureUtf8(text);
     });

@@ -1,7 +1,7 @@
 #include "PythonText.hpp"
 
 #include "platform/HugePages.hpp"
-#include "platform/Text.hpp"
+#include <dexmor/platform/Text.hpp>
 
 #include <algorithm>
 #include <cstdint>

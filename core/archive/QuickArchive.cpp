@@ -1,6 +1,6 @@
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
 
-#include "platform/Text.hpp"
+#include <dexmor/platform/Text.hpp>
 
 #include <algorithm>
 #include <cstring>

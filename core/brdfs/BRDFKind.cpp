@@ -1,7 +1,7 @@
-#include "brdfs/BRDFKind.hpp"
+#include <dexmor/brdfs/BRDFKind.hpp>
 
-#include "textures/ColorTextures.hpp"
-#include "textures/TextureFunctions.hpp"
+#include <dexmor/textures/ColorTextures.hpp>
+#include <dexmor/textures/TextureFunctions.hpp>
 
 namespace OrvexKavorCore::brdf {
 

@@ -1,8 +1,8 @@
-#include "brdfs/Base_BRDF.hpp"
+#include <dexmor/brdfs/Base_BRDF.hpp>
 
-#include "archive/QuickArchive.hpp"
-#include "archive/Record.hpp"
-#include "brdfs/BRDFs.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/archive/Record.hpp>
+#include <dexmor/brdfs/BRDFs.hpp>
 
 #include <boost/make_shared.hpp>
 

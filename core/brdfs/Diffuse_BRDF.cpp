@@ -1,4 +1,4 @@
-#include "brdfs/Diffuse_BRDF.hpp"
+#include <dexmor/brdfs/Diffuse_BRDF.hpp>
 
 #include <array>
 

@@ -1,4 +1,4 @@
-#include "brdfs/Glass_BRDF.hpp"
+#include <dexmor/brdfs/Glass_BRDF.hpp>
 
 #include <array>
 

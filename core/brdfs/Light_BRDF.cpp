@@ -1,4 +1,4 @@
-#include "brdfs/Light_BRDF.hpp"
+#include <dexmor/brdfs/Light_BRDF.hpp>
 
 #include <array>
 

@@ -1,6 +1,6 @@
-#include "brdfs/ReflectionBRDFs.hpp"
+#include <dexmor/brdfs/ReflectionBRDFs.hpp>
 
-#include "textures/ColorTextures.hpp"
+#include <dexmor/textures/ColorTextures.hpp>
 
 #include <array>
 

@@ -1,7 +1,7 @@
-#include "lights/BaseLight.hpp"
+#include <dexmor/lights/BaseLight.hpp>
 
-#include "lights/LightKinds.hpp"
-#include "lights/SunLight.hpp"
+#include <dexmor/lights/LightKinds.hpp>
+#include <dexmor/lights/SunLight.hpp>
 
 #include <boost/make_shared.hpp>
 

@@ -1,6 +1,6 @@
-#include "lights/LightKind.hpp"
+#include <dexmor/lights/LightKind.hpp>
 
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 namespace OrvexKavorCore {
 

@@ -3,7 +3,7 @@
 // Each record table lists the fields in the order of the current record; the
 // versions of a row say which records hold it. Every older record is the current
 // one with the newer rows left out.
-#include "lights/LightKinds.hpp"
+#include <dexmor/lights/LightKinds.hpp>
 
 #include <array>
 

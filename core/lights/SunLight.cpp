@@ -1,6 +1,6 @@
-#include "lights/SunLight.hpp"
+#include <dexmor/lights/SunLight.hpp>
 
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <array>
 #include <utility>
@@ -59,12 +59,18 @@ SunLight::SunLight(std::string sunName, std::string sunIdentifier)
     : identifier(std::move(sunIdentifier)), name(std::move(sunName)) {}
 
 void SunLight::writeXml(AssetXmlWriter& writer, std::string /*path*/) {
-    auto& urls = writer.sunUrls();
+    auto& urls = PerConversion<DocumentSunUrls>::current().urls;
     if (urls.count(identifier) != 0) return;
     std::string url = "/" + pluginType();
     if (!urls.empty()) url += std::to_string(urls.size());
     urls.emplace(identifier, url);
     writeAsset(writer, url);
+}
+
+std::string DocumentSunUrls::urlOf(const std::string& identifier) {
+    const auto& urls = PerConversion<DocumentSunUrls>::current().urls;
+    const auto found = urls.find(identifier);
+    return found == urls.end() ? std::string() : found->second;
 }
 
 } // namespace OrvexKavorCore

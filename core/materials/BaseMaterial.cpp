@@ -1,11 +1,11 @@
-#include "materials/BaseMaterial.hpp"
+#include <dexmor/materials/BaseMaterial.hpp>
 
-#include "archive/QuickArchive.hpp"
-#include "materials/CompositeMaterials.hpp"
-#include "materials/LayeredMaterials.hpp"
-#include "materials/ReferenceMaterials.hpp"
-#include "materials/SceneMaterials.hpp"
-#include "materials/WrapperMaterials.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/materials/CompositeMaterials.hpp>
+#include <dexmor/materials/LayeredMaterials.hpp>
+#include <dexmor/materials/ReferenceMaterials.hpp>
+#include <dexmor/materials/SceneMaterials.hpp>
+#include <dexmor/materials/WrapperMaterials.hpp>
 
 #include <boost/make_shared.hpp>
 
@@ -111,40 +111,6 @@ void BaseMaterial::releaseMaterialMembers() noexcept {
     } catch (const std::bad_alloc&) {
         // Without memory for the list, the rest is released the ordinary way.
     }
-}
-
-// --- MaterialWalk ---
-
-namespace {
-
-struct WalkStep {
-    MaterialWalk::Purpose purpose;
-    const void* material;
-    const void* other;
-    bool operator==(const WalkStep&) const = default;
-};
-
-thread_local std::vector<WalkStep> tWalkPath;
-
-} // namespace
-
-MaterialWalk::MaterialWalk(Purpose purpose, const void* material, const void* other) : state_(State::kEntered) {
-    const WalkStep step{purpose, material, other};
-    if (tWalkPath.size() >= QuickArchive::kMaxNesting)
-        state_ = State::kTooDeep;
-    else if (std::find(tWalkPath.begin(), tWalkPath.end(), step) != tWalkPath.end())
-        state_ = State::kCycle;
-    else
-        tWalkPath.push_back(step);
-}
-
-MaterialWalk::~MaterialWalk() {
-    if (state_ == State::kEntered) tWalkPath.pop_back();
-}
-
-bool MaterialWalk::isInside(Purpose purpose, const void* material) {
-    return std::any_of(tWalkPath.begin(), tWalkPath.end(),
-                       [&](const WalkStep& s) { return s.purpose == purpose && s.material == material; });
 }
 
 } // namespace OrvexKavorCore

@@ -1,6 +1,6 @@
-#include "materials/CompositeMaterials.hpp"
+#include <dexmor/materials/CompositeMaterials.hpp>
 
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <algorithm>
 #include <array>
@@ -91,8 +91,8 @@ void Material2Sided::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
     writeAssetOf(writer, translucencyTex, translucencyUrl);
     writeAssetOf(writer, transparencyTex, transparencyUrl);
     material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writePlugin("front", front, url);
-    writer.writePlugin("back", back, url);
+    writer.writePluginByName("front", url, nameOf(front));
+    writer.writePluginByName("back", url, nameOf(back));
     writer.writePlugin("translucency_tex", translucencyTex, translucencyUrl);
     writer.writePlugin("transparency_tex", transparencyTex, transparencyUrl);
     writer.writeColor("translucency", translucency);
@@ -123,8 +123,8 @@ void MaterialSkp2Sided::writeXml(AssetXmlWriter& writer, std::string urlPrefix) 
     writeAssetOf(writer, front, url);
     writeAssetOf(writer, back, url);
     material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writePlugin("front", front, url);
-    writer.writePlugin("back", back, url);
+    writer.writePluginByName("front", url, nameOf(front));
+    writer.writePluginByName("back", url, nameOf(back));
     writer.writeBool("force_1sided", force1Sided);
     material::endAsset(writer);
 }
@@ -149,8 +149,8 @@ void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::string urlPrefix)
     writeAssetOf(writer, mtlOne, url);
     writeAssetOf(writer, mtlTwo, url);
     material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writePlugin("mtl_one", mtlOne, url);
-    writer.writePlugin("mtl_two", mtlTwo, url);
+    writer.writePluginByName("mtl_one", url, nameOf(mtlOne));
+    writer.writePluginByName("mtl_two", url, nameOf(mtlTwo));
     writer.writeFloat("start_angle", startAngle);
     writer.writeFloat("stop_angle", stopAngle);
     material::endAsset(writer);

@@ -1,6 +1,6 @@
-#include "materials/LayeredMaterials.hpp"
+#include <dexmor/materials/LayeredMaterials.hpp>
 
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <algorithm>
 #include <array>

@@ -1,10 +1,12 @@
-#include "materials/MaterialAssets.hpp"
+#include <dexmor/materials/MaterialAssets.hpp>
 
-#include "materials/CompositeMaterials.hpp"
-#include "materials/LayeredMaterials.hpp"
-#include "materials/ReferenceMaterials.hpp"
-#include "materials/WrapperMaterials.hpp"
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/lights/SunLight.hpp>
+
+#include <dexmor/materials/CompositeMaterials.hpp>
+#include <dexmor/materials/LayeredMaterials.hpp>
+#include <dexmor/materials/ReferenceMaterials.hpp>
+#include <dexmor/materials/WrapperMaterials.hpp>
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <initializer_list>
 
@@ -57,7 +59,7 @@ boost::shared_ptr<Kind> firstOf(const MaterialPtr& material) {
 
 // A sub-material parameter: "/" + its name, written only for a referenceable one.
 void writeMaterialReference(AssetXmlWriter& writer, const char* name, const MaterialPtr& material) {
-    if (isReferenceable(material)) writer.writePlugin(name, material, std::string());
+    if (isReferenceable(material)) writer.writePluginByName(name, {}, nameOf(material));
 }
 
 void writeAngleBlendAsset(AssetXmlWriter& writer, const MaterialAngleBlend& blend) {
@@ -234,6 +236,9 @@ void writeMaterialAssets(AssetXmlWriter& writer, const MaterialPtr& material) {
 }
 
 std::string materialToXml(const MaterialPtr& material) {
+    // A document of its own: its sun assets are written anew.
+    DocumentSunUrls suns;
+    PerConversion<DocumentSunUrls>::Use document(suns);
     std::string xml;
     AssetXmlWriter writer(xml);
     writeMaterialAssets(writer, material);

@@ -1,7 +1,7 @@
-#include "materials/MaterialKind.hpp"
+#include <dexmor/materials/MaterialKind.hpp>
 
-#include "materials/SceneMaterials.hpp"
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/materials/SceneMaterials.hpp>
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 namespace OrvexKavorCore::material {
 

@@ -1,7 +1,7 @@
-#include "materials/ReferenceMaterials.hpp"
+#include <dexmor/materials/ReferenceMaterials.hpp>
 
-#include "materials/SceneMaterials.hpp"
-#include "platform/Text.hpp"
+#include <dexmor/materials/SceneMaterials.hpp>
+#include <dexmor/platform/Text.hpp>
 
 #include <array>
 

@@ -1,12 +1,12 @@
-#include "materials/SceneMaterials.hpp"
+#include <dexmor/materials/SceneMaterials.hpp>
 
-#include "archive/Members.hpp"
-#include "archive/QuickArchive.hpp"
-#include "materials/LayeredMaterials.hpp"
-#include "materials/MaterialKind.hpp"
-#include "materials/ReferenceMaterials.hpp"
-#include "platform/Text.hpp"
-#include "platform/Uuid.hpp"
+#include <dexmor/archive/Members.hpp>
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/materials/LayeredMaterials.hpp>
+#include <dexmor/materials/MaterialKind.hpp>
+#include <dexmor/materials/ReferenceMaterials.hpp>
+#include <dexmor/platform/Text.hpp>
+#include <dexmor/platform/Uuid.hpp>
 
 #include <boost/make_shared.hpp>
 

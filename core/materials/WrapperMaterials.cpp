@@ -1,7 +1,7 @@
-#include "materials/WrapperMaterials.hpp"
+#include <dexmor/materials/WrapperMaterials.hpp>
 
-#include "textures/TextureFunctions.hpp"
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/textures/TextureFunctions.hpp>
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <array>
 
@@ -152,7 +152,7 @@ void MaterialBump::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
     writeAssetOf(writer, bumpTex, bumpUrl);
     material::beginAsset(writer, url, "", kInfo.pluginType);
     writer.writeFloat("bump_tex_mult", bumpTexMult);
-    writer.writePlugin("base_mtl", baseMtl, url);
+    writer.writePluginByName("base_mtl", url, nameOf(baseMtl));
     writer.writePlugin("bump_tex", bumpTex, bumpUrl);
     material::endAsset(writer);
 }
@@ -198,7 +198,7 @@ void MaterialObjectExclusion::writeXml(AssetXmlWriter& writer, std::string urlPr
     const std::string url = urlPrefix + "/" + name;
     writeAssetOf(writer, baseMtl, url);
     material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writePlugin("base_mtl", baseMtl, url);
+    writer.writePluginByName("base_mtl", url, nameOf(baseMtl));
     writer.writeInteger("mode", mode);
     writer.writeBool("short_circuit", shortCircuit);
     writer.beginList("objects", "string");
@@ -227,7 +227,7 @@ void MaterialAlphaContribution::writeXml(AssetXmlWriter& writer, std::string url
     material::beginAsset(writer, url, "", kInfo.pluginType);
     writer.writeFloat("alpha", alpha);
     writer.writeFloat("alpha_tex_mult", alphaTexMult);
-    writer.writePlugin("base_mtl", baseMtl, url);
+    writer.writePluginByName("base_mtl", url, nameOf(baseMtl));
     writer.writePlugin("alpha_tex", alphaTex, alphaUrl);
     material::endAsset(writer);
 }
@@ -253,7 +253,7 @@ void MaterialToon::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
     writeAssetOf(writer, opacityTex, opacityUrl);
     writeAssetOf(writer, lineWidthTex, widthUrl);
     material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writePlugin("base_mtl", baseMtl, url);
+    writer.writePluginByName("base_mtl", url, nameOf(baseMtl));
     writer.writePlugin("color_tex", lineColorTex, colorUrl);
     writer.writePlugin("distort_tex", distortTex, distortUrl);
     writer.writePlugin("opacity_tex", opacityTex, opacityUrl);

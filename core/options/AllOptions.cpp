@@ -1,10 +1,10 @@
-#include "options/AllOptions.hpp"
+#include <dexmor/options/AllOptions.hpp>
 
-#include "archive/Members.hpp"
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/Members.hpp>
+#include <dexmor/archive/QuickArchive.hpp>
 #include "options/MemberEncodings.hpp"
 #include "options/RecordEncodings.hpp"
-#include "platform/Text.hpp"
+#include <dexmor/platform/Text.hpp>
 
 #include <array>
 

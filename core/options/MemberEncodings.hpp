@@ -8,8 +8,8 @@
 //   record::fieldAs<record::enc::Record, &AllOptions::frameData>("frameData")
 //   record::fieldAs<record::enc::Animated, &PhysicalCamera::focal_length>("focal_length", record::since(2))
 //   record::fieldAs<record::enc::AnimatedAsPlain, &PhysicalCamera::focal_length>("focal_length", record::between(1, 1))
-#include "archive/QuickArchive.hpp"
-#include "params/AnimatedValues.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/params/AnimatedValues.hpp>
 
 #include <string>
 

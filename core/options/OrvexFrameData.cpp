@@ -1,8 +1,8 @@
-#include "options/OrvexFrameData.hpp"
+#include <dexmor/options/OrvexFrameData.hpp>
 
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
 #include "options/RecordEncodings.hpp"
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <array>
 

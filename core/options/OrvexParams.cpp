@@ -1,6 +1,6 @@
-#include "options/OrvexParams.hpp"
+#include <dexmor/options/OrvexParams.hpp>
 
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
 #include "options/RecordEncodings.hpp"
 
 #include <array>

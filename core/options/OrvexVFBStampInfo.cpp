@@ -1,6 +1,6 @@
-#include "options/OrvexVFBStampInfo.hpp"
+#include <dexmor/options/OrvexVFBStampInfo.hpp>
 
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
 
 namespace OrvexKavorCore {
 

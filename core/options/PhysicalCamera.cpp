@@ -1,6 +1,6 @@
-#include "options/PhysicalCamera.hpp"
+#include <dexmor/options/PhysicalCamera.hpp>
 
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
 #include "options/MemberEncodings.hpp"
 #include "options/RecordEncodings.hpp"
 

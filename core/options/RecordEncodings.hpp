@@ -5,8 +5,8 @@
 //   record::fieldAs<enc::Float32, &KavorFrameData::fov>("fov")
 // states the encoding the way a record layout reads ("fov, Float32"), and the
 // compiler checks it against the member: a float member cannot be declared Int32.
-#include "archive/QuickArchive.hpp"
-#include "platform/KavorTypes.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/platform/KavorTypes.hpp>
 
 #include <cstdint>
 #include <string>

@@ -1,4 +1,4 @@
-#include "options/RenderChannels.hpp"
+#include <dexmor/options/RenderChannels.hpp>
 
 #include <array>
 

@@ -1,9 +1,9 @@
-#include "options/RenderView.hpp"
+#include <dexmor/options/RenderView.hpp>
 
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
 #include "options/MemberEncodings.hpp"
 #include "options/RecordEncodings.hpp"
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <array>
 #include <numbers>

@@ -17,9 +17,9 @@
 // A TEXTURE row refers to a texture that is written as an asset of its own, under
 // the url PATH/NAME/CHILD, inside the same "Assets" element ahead of the section's
 // asset; an unset texture gives the parameter without a value.
-#include "options/AllOptions.hpp"
-#include "options/RenderChannels.hpp"
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/options/AllOptions.hpp>
+#include <dexmor/options/RenderChannels.hpp>
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <array>
 #include <span>

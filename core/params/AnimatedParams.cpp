@@ -1,6 +1,6 @@
-#include "params/AnimatedParams.hpp"
+#include <dexmor/params/AnimatedParams.hpp>
 
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
 
 #include <cmath>
 #include <vector>

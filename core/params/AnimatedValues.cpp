@@ -1,4 +1,4 @@
-#include "params/AnimatedValues.hpp"
+#include <dexmor/params/AnimatedValues.hpp>
 
 #include <algorithm>
 #include <cmath>

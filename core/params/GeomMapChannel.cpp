@@ -1,6 +1,6 @@
-#include "params/GeomMapChannel.hpp"
+#include <dexmor/params/GeomMapChannel.hpp>
 
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
 
 #include <boost/make_shared.hpp>
 

@@ -1,6 +1,6 @@
-#include "params/NestedListParams.hpp"
+#include <dexmor/params/NestedListParams.hpp>
 
-#include "platform/Text.hpp"
+#include <dexmor/platform/Text.hpp>
 
 namespace OrvexKavorCore {
 

@@ -1,4 +1,4 @@
-#include "params/PluginParameter.hpp"
+#include <dexmor/params/PluginParameter.hpp>
 
 #include <algorithm>
 #include <new>

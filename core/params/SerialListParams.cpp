@@ -1,6 +1,6 @@
-#include "params/SerialListParams.hpp"
+#include <dexmor/params/SerialListParams.hpp>
 
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
 
 #include <cstdint>
 #include <limits>

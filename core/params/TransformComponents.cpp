@@ -1,6 +1,9 @@
-#include "params/TransformComponents.hpp"
+#include <dexmor/params/TransformComponents.hpp>
 
-#include "archive/QuickArchive.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/xml/AssetXmlWriter.hpp>
+
+#include <array>
 
 #include <cmath>
 
@@ -96,6 +99,33 @@ bool operator==(const TransformComponents& a, const TransformComponents& b) {
            a.x_scale == b.x_scale && a.y_scale == b.y_scale && a.z_scale == b.z_scale && a.x_offset == b.x_offset &&
            a.y_offset == b.y_offset && a.z_offset == b.z_offset && a.x_mirror == b.x_mirror &&
            a.y_mirror == b.y_mirror && a.z_mirror == b.z_mirror;
+}
+
+namespace {
+
+void writeComponents(AssetXmlWriter& writer, std::string_view name, std::string_view type,
+                     const TransformComponents& c, std::string_view label) {
+    const std::array<AssetXmlWriter::NumberLine, 12> lines{{
+        {"x_rotation", c.x_rotation}, {"y_rotation", c.y_rotation}, {"z_rotation", c.z_rotation},
+        {"x_scale", c.x_scale},       {"y_scale", c.y_scale},       {"z_scale", c.z_scale},
+        {"x_offset", c.x_offset},     {"y_offset", c.y_offset},     {"z_offset", c.z_offset},
+        {"x_mirror", static_cast<double>(c.x_mirror), true},
+        {"y_mirror", static_cast<double>(c.y_mirror), true},
+        {"z_mirror", static_cast<double>(c.z_mirror), true},
+    }};
+    writer.writeNumberBlock(name, type, lines, label);
+}
+
+} // namespace
+
+void writeComponentMatrix(AssetXmlWriter& writer, std::string_view name, const TransformComponents& value,
+                          std::string_view label) {
+    writeComponents(writer, name, "componentMatrix", value, label);
+}
+
+void writeComponentTransform(AssetXmlWriter& writer, std::string_view name, const TransformComponents& value,
+                             std::string_view label) {
+    writeComponents(writer, name, "componentTransform", value, label);
 }
 
 } // namespace OrvexKavorCore

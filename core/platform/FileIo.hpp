@@ -1,6 +1,6 @@
 #pragma once
 // Reading and writing whole files.
-#include "platform/SharedBytes.hpp"
+#include <dexmor/platform/SharedBytes.hpp>
 
 #include <filesystem>
 #include <optional>

@@ -1,4 +1,4 @@
-#include "platform/SharedBytes.hpp"
+#include <dexmor/platform/SharedBytes.hpp>
 
 #include "platform/HugePages.hpp"
 

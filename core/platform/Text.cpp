@@ -1,4 +1,4 @@
-#include "platform/Text.hpp"
+#include <dexmor/platform/Text.hpp>
 
 #include <algorithm>
 #include <array>

@@ -1,4 +1,4 @@
-#include "platform/Uuid.hpp"
+#include <dexmor/platform/Uuid.hpp>
 
 #include <boost/uuid/random_generator.hpp>
 #include <boost/uuid/uuid_io.hpp>

@@ -1,6 +1,6 @@
-#include "textures/BaseBitmap.hpp"
+#include <dexmor/textures/BaseBitmap.hpp>
 
-#include "textures/BitmapBuffer.hpp"
+#include <dexmor/textures/BitmapBuffer.hpp>
 
 #include <boost/make_shared.hpp>
 

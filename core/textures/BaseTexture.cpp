@@ -1,10 +1,10 @@
-#include "textures/BaseTexture.hpp"
+#include <dexmor/textures/BaseTexture.hpp>
 
-#include "archive/QuickArchive.hpp"
-#include "textures/BitmapTexture.hpp"
-#include "textures/ColorTextures.hpp"
-#include "textures/PatternTextures.hpp"
-#include "textures/SkyTexture.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/textures/BitmapTexture.hpp>
+#include <dexmor/textures/ColorTextures.hpp>
+#include <dexmor/textures/PatternTextures.hpp>
+#include <dexmor/textures/SkyTexture.hpp>
 
 #include <boost/make_shared.hpp>
 
@@ -45,14 +45,6 @@ TexturePtr createTexture(std::int32_t kind) {
         return {};
     }
 }
-
-namespace {
-thread_local unsigned tWalkDepth = 0;
-} // namespace
-
-BaseTexture::Descent::Descent() : ok_(++tWalkDepth <= QuickArchive::kMaxNesting) {}
-
-BaseTexture::Descent::~Descent() { --tWalkDepth; }
 
 void BaseTexture::releaseTextureMembers() noexcept {
     std::vector<TexturePtr> pending;

@@ -1,6 +1,6 @@
-#include "textures/BaseUVW.hpp"
+#include <dexmor/textures/BaseUVW.hpp>
 
-#include "textures/UVWGenerators.hpp"
+#include <dexmor/textures/UVWGenerators.hpp>
 
 #include <boost/make_shared.hpp>
 

@@ -1,8 +1,8 @@
-#include "textures/BitmapBuffer.hpp"
+#include <dexmor/textures/BitmapBuffer.hpp>
 
-#include "archive/QuickArchive.hpp"
-#include "platform/Text.hpp"
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/platform/Text.hpp>
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <boost/make_shared.hpp>
 

@@ -1,4 +1,4 @@
-#include "textures/BitmapTexture.hpp"
+#include <dexmor/textures/BitmapTexture.hpp>
 
 #include <array>
 #include <string>

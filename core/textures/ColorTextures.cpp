@@ -1,4 +1,4 @@
-#include "textures/ColorTextures.hpp"
+#include <dexmor/textures/ColorTextures.hpp>
 
 #include <array>
 

@@ -1,4 +1,4 @@
-#include "textures/PatternTextures.hpp"
+#include <dexmor/textures/PatternTextures.hpp>
 
 #include <array>
 

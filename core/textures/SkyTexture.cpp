@@ -1,7 +1,7 @@
-#include "textures/SkyTexture.hpp"
+#include <dexmor/textures/SkyTexture.hpp>
 
-#include "platform/Text.hpp"
-#include "platform/Uuid.hpp"
+#include <dexmor/platform/Text.hpp>
+#include <dexmor/platform/Uuid.hpp>
 
 #include <boost/make_shared.hpp>
 
@@ -10,9 +10,6 @@
 namespace OrvexKavorCore {
 
 namespace {
-
-// Each thread converts with its own default sun (see resetSharedDefaultSun).
-thread_local boost::shared_ptr<SunLight> tDefaultSun;
 
 // The identifier is text compared ignoring the case of ASCII letters.
 struct IdentifierText {
@@ -60,21 +57,19 @@ constexpr std::array kSkyParameters = {
         [](AssetXmlWriter& w, const char* n, const SkyTexture& sky, const std::string&) {
             std::string sunUrl;
             if (const SunLight* s = sky.sunLight()) {
-                const auto found = w.sunUrls().find(s->identifier);
-                if (found != w.sunUrls().end()) sunUrl = found->second;
+                sunUrl = DocumentSunUrls::urlOf(s->identifier);
             }
-            w.writeSunPlugin(n, sky.sun, sunUrl);
+            w.writePluginUrl(n, static_cast<bool>(sky.sun), sunUrl);
         }},
 };
 
 } // namespace
 
-void resetSharedDefaultSun() { tDefaultSun = boost::make_shared<SunLight>(kDefaultSunName, kDefaultSunIdentifier); }
-
-boost::shared_ptr<SunLight> sharedDefaultSun() {
-    if (!tDefaultSun) resetSharedDefaultSun();
-    return tDefaultSun;
+boost::shared_ptr<SunLight> DefaultSun::pristine() {
+    return boost::make_shared<SunLight>(kDefaultSunName, kDefaultSunIdentifier);
 }
+
+boost::shared_ptr<SunLight> sharedDefaultSun() { return PerConversion<DefaultSun>::current().light; }
 
 std::span<const texture::Member<SkyTexture>> SkyTexture::members() { return kSkyMembers; }
 std::span<const record::Field<SkyTexture>> SkyTexture::fields() { return kSkyFields; }
@@ -124,7 +119,9 @@ bool SkyTexture::readFromArchive(QuickArchive& ar) {
     if (!record::readFields(ar, *this, fields(), v)) return false;
     if (v < 3) return true;
 
-    const boost::shared_ptr<SunLight> defaultSun = sharedDefaultSun();
+    DefaultSun& shared = PerConversion<DefaultSun>::current();
+    const boost::shared_ptr<SunLight> defaultSun = shared.light;
+    ++shared.writes;
     {
         QuickArchive::Scope scope(ar, "light", "default sun");
         if (!scope || !defaultSun->readFromArchive(ar)) return false;

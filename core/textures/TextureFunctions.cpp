@@ -1,10 +1,10 @@
-#include "textures/TextureFunctions.hpp"
+#include <dexmor/textures/TextureFunctions.hpp>
 
-#include "textures/BitmapBuffer.hpp"
-#include "textures/BitmapTexture.hpp"
-#include "textures/ColorTextures.hpp"
-#include "textures/PatternTextures.hpp"
-#include "textures/UVWGenerators.hpp"
+#include <dexmor/textures/BitmapBuffer.hpp>
+#include <dexmor/textures/BitmapTexture.hpp>
+#include <dexmor/textures/ColorTextures.hpp>
+#include <dexmor/textures/PatternTextures.hpp>
+#include <dexmor/textures/UVWGenerators.hpp>
 
 #include <boost/make_shared.hpp>
 

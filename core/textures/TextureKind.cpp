@@ -1,4 +1,4 @@
-#include "textures/TextureKind.hpp"
+#include <dexmor/textures/TextureKind.hpp>
 
 namespace OrvexKavorCore::texture {
 

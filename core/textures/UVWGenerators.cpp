@@ -1,7 +1,7 @@
-#include "textures/UVWGenerators.hpp"
+#include <dexmor/textures/UVWGenerators.hpp>
 
-#include "archive/QuickArchive.hpp"
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <boost/make_shared.hpp>
 
@@ -64,7 +64,7 @@ void GenProjectionUVW::updateTransforms() { uvwTransform = uvwComponents.buildTr
 void GenProjectionUVW::writeXml(AssetXmlWriter& writer, std::string url) {
     updateTransforms();
     beginGenerator(writer, *this, url);
-    writer.writeComponentTransform("uvw_transform", uvwComponents);
+    writeComponentTransform(writer, "uvw_transform", uvwComponents);
     endGenerator(writer);
 }
 
@@ -130,7 +130,7 @@ bool GenEnvironmentUVW::isEqual(const UVWPtr& other) const {
 void GenEnvironmentUVW::writeXml(AssetXmlWriter& writer, std::string url) {
     updateTransforms();
     beginGenerator(writer, *this, url);
-    writer.writeComponentMatrix("uvw_matrix", uvwComponents);
+    writeComponentMatrix(writer, "uvw_matrix", uvwComponents);
     writer.writeString("mapping_type", environmentMappingName(mappingType));
     endGenerator(writer);
 }
@@ -188,7 +188,7 @@ bool GenChannelUVW::isEqual(const UVWPtr& other) const {
 void GenChannelUVW::writeXml(AssetXmlWriter& writer, std::string url) {
     updateTransforms();
     beginGenerator(writer, *this, url);
-    writer.writeComponentTransform("uvw_transform", uvwComponents);
+    writeComponentTransform(writer, "uvw_transform", uvwComponents);
     writer.writeTransform("tex_transform", texTransform);
     writer.writeInteger("wrap_u", wrap_u);
     writer.writeInteger("wrap_v", wrap_v);

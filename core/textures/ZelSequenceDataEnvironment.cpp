@@ -1,4 +1,4 @@
-#include "textures/ZelSequenceDataEnvironment.hpp"
+#include <dexmor/textures/ZelSequenceDataEnvironment.hpp>
 
 namespace OrvexKavorCore {
 

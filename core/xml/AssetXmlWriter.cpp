@@ -1,20 +1,14 @@
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
-#include "lights/BaseLight.hpp"
-#include "materials/BaseMaterial.hpp"
-#include "options/BaseCamera.hpp"
-#include "params/TransformComponents.hpp"
+#include <dexmor/platform/Text.hpp>
+#include <dexmor/xml/XmlSerializable.hpp>
+
 #include "platform/HugePages.hpp"
-#include "platform/Text.hpp"
-#include "textures/BaseBitmap.hpp"
-#include "textures/BaseTexture.hpp"
-#include "textures/BaseUVW.hpp"
 #include "xml/NumberFormat.hpp"
 
 #include <array>
 #include <charconv>
 #include <cstring>
-#include <stdexcept>
 
 namespace OrvexKavorCore {
 
@@ -79,18 +73,44 @@ void AssetXmlWriter::flush() {
     reserveForAppend(out_, pendingSize_);
     out_.append(pending_, pendingSize_);
     pendingSize_ = 0;
+    if (stream_ && out_.size() >= pieceSize_) sendPiece();
+}
+
+void AssetXmlWriter::sendPiece() {
+    (*stream_)(out_);
+    out_.clear();
+}
+
+void AssetXmlWriter::streamTo(const TextSink* sink, std::size_t pieceSize) {
+    flush();
+    stream_ = sink;
+    pieceSize_ = pieceSize;
+    if (stream_ && !out_.empty()) sendPiece();
 }
 
 void AssetXmlWriter::putLong(std::string_view text) {
     flush();
-    if (text.size() <= kPendingSize) return put(text);
-    out_.append(text);
+    // Long text goes out in pieces of the pending store's size, so that a piece
+    // sent on stays near the streaming size however long one name is.
+    while (text.size() > kPendingSize) {
+        put(text.substr(0, kPendingSize));
+        flush();
+        text.remove_prefix(kPendingSize);
+    }
+    put(text);
 }
 
 void AssetXmlWriter::putNarrow(std::string_view narrow) {
     if (text::isAscii(narrow)) return put(narrow);
-    flush();
-    text::appendLatin1AsUtf8(out_, narrow);
+    // Latin-1 widens each byte to at most two: in runs that fit the pending store.
+    constexpr std::size_t kRun = kPendingSize / 2;
+    while (!narrow.empty()) {
+        const std::string_view run = narrow.substr(0, kRun);
+        flush();
+        text::appendLatin1AsUtf8(out_, run);
+        narrow.remove_prefix(run.size());
+    }
+    if (stream_ && out_.size() >= pieceSize_) sendPiece();
 }
 
 template <bool kAllEntities, bool kNarrow>
@@ -166,20 +186,6 @@ void AssetXmlWriter::vectorBlock(const Vector& v) {
     line("</vector>");
 }
 
-void AssetXmlWriter::componentLines(const TransformComponents& c) {
-    floatLine("x_rotation", c.x_rotation);
-    floatLine("y_rotation", c.y_rotation);
-    floatLine("z_rotation", c.z_rotation);
-    floatLine("x_scale", c.x_scale);
-    floatLine("y_scale", c.y_scale);
-    floatLine("z_scale", c.z_scale);
-    floatLine("x_offset", c.x_offset);
-    floatLine("y_offset", c.y_offset);
-    floatLine("z_offset", c.z_offset);
-    integerLine("x_mirror", c.x_mirror);
-    integerLine("y_mirror", c.y_mirror);
-    integerLine("z_mirror", c.z_mirror);
-}
 
 void AssetXmlWriter::parameterStart(std::string_view name, std::string_view type, std::string_view label,
                                     std::string_view listType, bool userData, bool ownTypeWords) {
@@ -436,88 +442,42 @@ void AssetXmlWriter::writeTransform(std::string_view name, const Transform& valu
     endBlockParameter();
 }
 
-void AssetXmlWriter::writeComponentMatrix(std::string_view name, const TransformComponents& value,
-                                          std::string_view label) {
-    beginBlockParameter(name, "componentMatrix", label);
-    componentLines(value);
-    endBlockParameter();
-}
-
-void AssetXmlWriter::writeComponentTransform(std::string_view name, const TransformComponents& value,
-                                             std::string_view label) {
-    beginBlockParameter(name, "componentTransform", label);
-    componentLines(value);
+void AssetXmlWriter::writeNumberBlock(std::string_view name, std::string_view type,
+                                      std::span<const NumberLine> lines, std::string_view label) {
+    beginBlockParameter(name, type, label);
+    for (const NumberLine& l : lines) {
+        if (l.isInteger)
+            integerLine(l.tag, static_cast<std::int32_t>(l.value));
+        else
+            floatLine(l.tag, static_cast<float>(l.value));
+    }
     endBlockParameter();
 }
 
 // --- plugin parameters ---
 
-void AssetXmlWriter::writePlugin(std::string_view name, const boost::shared_ptr<BaseTexture>& object,
-                                 std::string_view path, std::string_view label) {
+void AssetXmlWriter::writePlugin(std::string_view name, const OrvexXMLSerializable* object, std::string_view path,
+                                 std::string_view label) {
     if (!object) return emptyPlugin(name, label);
     pluginReference(name, path, object->pluginType(), false, label);
 }
 
-void AssetXmlWriter::writePlugin(std::string_view name, const boost::shared_ptr<BaseUVW>& object,
-                                 std::string_view path, std::string_view label) {
-    if (!object) return emptyPlugin(name, label);
-    pluginReference(name, path, object->pluginType(), false, label);
+void AssetXmlWriter::writePluginByName(std::string_view name, std::string_view path, const std::string* objectName,
+                                       std::string_view label) {
+    if (!objectName) return emptyPlugin(name, label);
+    pluginReference(name, path, *objectName, true, label);
 }
 
-void AssetXmlWriter::writePlugin(std::string_view name, const boost::shared_ptr<BaseCamera>& object,
-                                 std::string_view path, std::string_view label) {
-    if (!object) return emptyPlugin(name, label);
-    pluginReference(name, path, object->pluginType(), false, label);
-}
-
-void AssetXmlWriter::writePlugin(std::string_view name, const boost::shared_ptr<BaseBitmap>& object,
-                                 std::string_view path, std::string_view label) {
-    if (!object) return emptyPlugin(name, label);
-    pluginReference(name, path, object->pluginType(), false, label);
-}
-
-void AssetXmlWriter::writePlugin(std::string_view name, const boost::shared_ptr<BaseLight>& object,
-                                 std::string_view path, std::string_view label) {
-    if (!object) return emptyPlugin(name, label);
-    pluginReference(name, path, object->pluginType(), false, label);
-}
-
-void AssetXmlWriter::writePlugin(std::string_view name, const boost::shared_ptr<BaseMaterial>& object,
-                                 std::string_view path, std::string_view label) {
-    if (!object) return emptyPlugin(name, label);
-    pluginReference(name, path, object->name, true, label);
-}
-
-// An absent sun refers to nothing, like an absent object of any other family.
-void AssetXmlWriter::writeSunPlugin(std::string_view name, const boost::shared_ptr<BaseLight>& sun,
-                                    std::string_view url, std::string_view label) {
-    if (!sun) return emptyPlugin(name, label);
+// An absent object refers to nothing, like an absent object of any other family.
+void AssetXmlWriter::writePluginUrl(std::string_view name, bool present, std::string_view url,
+                                    std::string_view label) {
+    if (!present) return emptyPlugin(name, label);
     parameterStart(name, "plugin", label, "none", false);
     inlineValueStart();
     putWithEntities<true, false>(url);
     inlineValueEnd();
     parameterEnd();
     flush();
-}
-
-void AssetXmlWriter::writePlugin(std::string_view name, const boost::any& object, std::string_view path,
-                                 std::string_view label) {
-    // The families in the order they are tried.
-    if (const auto* texture = boost::any_cast<boost::shared_ptr<BaseTexture>>(&object))
-        return writePlugin(name, *texture, path, label);
-    if (const auto* material = boost::any_cast<boost::shared_ptr<BaseMaterial>>(&object))
-        return writePlugin(name, *material, path, label);
-    if (const auto* uvw = boost::any_cast<boost::shared_ptr<BaseUVW>>(&object))
-        return writePlugin(name, *uvw, path, label);
-    if (const auto* camera = boost::any_cast<boost::shared_ptr<BaseCamera>>(&object))
-        return writePlugin(name, *camera, path, label);
-    if (const auto* bitmap = boost::any_cast<boost::shared_ptr<BaseBitmap>>(&object))
-        return writePlugin(name, *bitmap, path, label);
-    if (const auto* light = boost::any_cast<boost::shared_ptr<BaseLight>>(&object))
-        return writePlugin(name, *light, path, label);
-    throw std::invalid_argument("plugin parameter \"" + std::string(name) +
-                                "\": the value holds no object of a plugin family (held type " +
-                                object.type().name() + ")");
 }
 
 // --- lists ---

@@ -2,9 +2,9 @@
 // their use in record tables.
 #include "TestSupport.hpp"
 
-#include "archive/Record.hpp"
-#include "params/AnimatedParams.hpp"
-#include "params/AnimatedValues.hpp"
+#include <dexmor/archive/Record.hpp>
+#include <dexmor/params/AnimatedParams.hpp>
+#include <dexmor/params/AnimatedValues.hpp>
 
 #include <gtest/gtest.h>
 

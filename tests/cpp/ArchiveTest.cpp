@@ -1,7 +1,7 @@
 // The archive's byte layouts, its chunking, and its guards against damaged data.
 #include "TestSupport.hpp"
 
-#include "archive/Record.hpp"
+#include <dexmor/archive/Record.hpp>
 
 #include <gtest/gtest.h>
 

@@ -3,8 +3,8 @@
 // comparison, copies and the XML assets.
 #include "TestSupport.hpp"
 
-#include "brdfs/BRDFs.hpp"
-#include "textures/Textures.hpp"
+#include <dexmor/brdfs/BRDFs.hpp>
+#include <dexmor/textures/Textures.hpp>
 
 #include <boost/make_shared.hpp>
 #include <gtest/gtest.h>

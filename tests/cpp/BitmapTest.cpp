@@ -1,7 +1,7 @@
 // Bitmap buffers: the factory, the record, comparison of file names and the XML asset.
 #include "TestSupport.hpp"
 
-#include "textures/BitmapBuffer.hpp"
+#include <dexmor/textures/BitmapBuffer.hpp>
 
 #include <boost/make_shared.hpp>
 #include <gtest/gtest.h>

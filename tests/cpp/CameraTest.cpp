@@ -2,8 +2,8 @@
 // assembled here byte by byte, and the render view's asset.
 #include "TestSupport.hpp"
 
-#include "options/PhysicalCamera.hpp"
-#include "options/RenderView.hpp"
+#include <dexmor/options/PhysicalCamera.hpp>
+#include <dexmor/options/RenderView.hpp>
 
 #include <gtest/gtest.h>
 

@@ -3,17 +3,19 @@
 // diagnosis says what a file holds or why it did not read.
 #include "MaterialTestSupport.hpp"
 
-#include "archive/Conversion.hpp"
-#include "archive/ZelMatFile.hpp"
-#include "brdfs/BRDFs.hpp"
-#include "textures/SkyTexture.hpp"
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/files/ConversionContext.hpp>
+#include <dexmor/dexmor.hpp>
+#include <dexmor/files/ZelMatFile.hpp>
+#include <dexmor/brdfs/BRDFs.hpp>
+#include <dexmor/textures/SkyTexture.hpp>
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <fstream>
 #include <iterator>
 #include <sstream>
 
 using namespace materialtest;
+using namespace testsupport;
 
 namespace {
 
@@ -37,7 +39,7 @@ std::string libraryBytes(std::vector<MaterialPtr> materials) {
 
 // The document as the library read whole gives it.
 std::string wholeDocument(const std::string& bytes) {
-    resetSharedDefaultSun();
+    const ConversionContext fresh1;
     ZelMatFile file;
     EXPECT_TRUE(file.readFromBytes(bytes));
     std::string xml;
@@ -46,18 +48,24 @@ std::string wholeDocument(const std::string& bytes) {
     return xml;
 }
 
-// The text a destination that drops what it was sent on request ends up with.
-std::string readOnceIntoFile(const std::string& bytes, int* takenBack = nullptr) {
-    std::string file;
+// A destination that can take back what it was sent, counting how often it did.
+struct TakingBack final : DocumentSink {
+    std::string text;
     int drops = 0;
-    ZelMatFile().bytesToXml(
-        SharedBytes::copyOf(bytes), [&file](std::string_view piece) { file.append(piece); },
-        [&] {
-            file.clear();
-            ++drops;
-        });
-    if (takenBack) *takenBack = drops;
-    return file;
+    void write(std::string_view piece) override { text.append(piece); }
+    bool canTakeBack() const override { return true; }
+    void takeBack() override {
+        text.clear();
+        ++drops;
+    }
+};
+
+// The text a destination that takes back what it was sent ends up with.
+std::string readOnceIntoFile(const std::string& bytes, int* takenBack = nullptr) {
+    TakingBack file;
+    convert(FileKind::MaterialLibrary, Input::ofBytes(bytes), file);
+    if (takenBack) *takenBack = file.drops;
+    return file.text;
 }
 
 std::string sample(const char* name) {
@@ -80,13 +88,7 @@ TEST_F(Conversions, StreamingSendsEachMaterialAndMatchesTheWholeDocument) {
     EXPECT_NE(expected.find("<value>9.25</value>"), std::string::npos);
     EXPECT_EQ(expected.find("<value>7.5</value>"), std::string::npos);
 
-    std::vector<std::string> pieces;
-    resetSharedDefaultSun();
-    ZelMatFile().bytesToXml(SharedBytes::copyOf(bytes),
-                            [&](std::string_view piece) { pieces.emplace_back(piece); });
-    ASSERT_EQ(pieces.size(), 3u);
-    for (const std::string& piece : pieces) EXPECT_TRUE(piece.starts_with("<Assets>")) << piece;
-    EXPECT_EQ(pieces[0] + pieces[1] + pieces[2], expected);
+    EXPECT_EQ(streamedXml(FileKind::MaterialLibrary, bytes), expected);
     // Converted whole, or into a destination that can drop what it was sent, each
     // material is read once: the skies' differing default suns send it back to
     // the two readings.
@@ -107,22 +109,36 @@ TEST_F(Conversions, ALibraryFailingAtItsLastMaterialSendsNoMaterial) {
     const std::size_t secondAt = storedForm(make<MaterialLayeredBRDF>("a")).size();
     bytes[12 + secondAt] = 99; // the second material's kind id, in the first chunk
 
-    std::vector<std::string> pieces;
-    ZelMatFile file;
-    file.bytesToXml(SharedBytes::copyOf(bytes),
-                    [&](std::string_view piece) { pieces.emplace_back(piece); });
-    EXPECT_EQ(pieces, std::vector<std::string>{""}); // the pass-through text: the header starts with a NUL
+    EXPECT_EQ(streamedPieces(FileKind::MaterialLibrary, bytes),
+              std::vector<std::string>{""}); // the pass-through text: the header starts with a NUL
     // Converted whole, or into a destination that can drop what it was sent, the
     // library's text is taken back before the pass-through text.
     std::string document = "kept";
-    file.bytesToXml(SharedBytes::copyOf(bytes), document);
+    StringSink whole(document);
+    const Diagnosis result = convert(FileKind::MaterialLibrary, Input::ofBytes(bytes), whole);
     EXPECT_EQ(document, "kept");
     int takenBack = 0;
     EXPECT_EQ(readOnceIntoFile(bytes, &takenBack), "");
-    EXPECT_EQ(takenBack, 1); // the first material had been sent
-    ASSERT_TRUE(file.lastReadFailure());
-    EXPECT_EQ(file.lastReadFailure()->describe(),
+    EXPECT_EQ(takenBack, 1);
+    EXPECT_FALSE(result.readsAsBinary);
+    ASSERT_TRUE(result.failure);
+    EXPECT_EQ(result.failure->describe(),
               "material 1: unknown material kind 99 at offset " + std::to_string(12 + secondAt + 4));
+}
+
+TEST_F(Conversions, ADefaultSunChangedOnlyFromZeroToMinusZeroGivesOneDocument) {
+    // Every stored copy of the default sun's shadow bias is 0, the last one -0:
+    // the skies must show "-0" however the library is read.
+    const float marker = 1234.5f;
+    sharedDefaultSun()->shadowBias = marker;
+    std::string bytes = libraryBytes({materialWithSky("first"), materialWithSky("second")});
+    const std::string stored(reinterpret_cast<const char*>(&marker), 4);
+    const std::size_t last = bytes.rfind(stored);
+    for (std::size_t at = bytes.find(stored); at != std::string::npos; at = bytes.find(stored, at + 4))
+        bytes.replace(at, 4, at == last ? std::string("\x00\x00\x00\x80", 4) : std::string(4, '\0'));
+    const std::string once = convertBytesToXml(FileKind::MaterialLibrary, bytes);
+    EXPECT_EQ(once, streamedXml(FileKind::MaterialLibrary, bytes));
+    EXPECT_NE(once.find("<value>-0</value>"), std::string::npos);
 }
 
 TEST_F(Conversions, DiagnosisSaysWhatAFileHoldsOrWhyItDidNotRead) {

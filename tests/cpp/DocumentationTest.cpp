@@ -1,10 +1,10 @@
 // The record-version tables of docs/maintainers.md state each kind's id and the
 // version its writer produces; they must say what the code does.
-#include "brdfs/BRDFs.hpp"
-#include "lights/LightKinds.hpp"
-#include "lights/SunLight.hpp"
-#include "materials/Materials.hpp"
-#include "textures/Textures.hpp"
+#include <dexmor/brdfs/BRDFs.hpp>
+#include <dexmor/lights/LightKinds.hpp>
+#include <dexmor/lights/SunLight.hpp>
+#include <dexmor/materials/Materials.hpp>
+#include <dexmor/textures/Textures.hpp>
 
 #include <gtest/gtest.h>
 

@@ -1,5 +1,5 @@
 // The environment colour lookup: which slot a ray uses and what the slot gives.
-#include "textures/ZelSequenceDataEnvironment.hpp"
+#include <dexmor/textures/ZelSequenceDataEnvironment.hpp>
 
 #include <gtest/gtest.h>
 

@@ -1,8 +1,10 @@
 // The framing of material library and render-options files, the pass-through of
 // files that are not binary, and saving without losing the previous file.
-#include "archive/Conversion.hpp"
-#include "archive/ZelMatFile.hpp"
-#include "archive/ZelOptFile.hpp"
+#include "TestSupport.hpp"
+
+#include <dexmor/dexmor.hpp>
+#include <dexmor/files/ZelMatFile.hpp>
+#include <dexmor/files/ZelOptFile.hpp>
 
 #include <gtest/gtest.h>
 
@@ -13,6 +15,7 @@
 #include <sys/stat.h>
 
 using namespace OrvexKavorCore;
+using testsupport::convertToXml;
 namespace fs = std::filesystem;
 
 namespace {

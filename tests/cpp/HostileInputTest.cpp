@@ -3,18 +3,19 @@
 // and the reason each reader family records when it refuses a record.
 #include "MaterialTestSupport.hpp"
 
-#include "archive/Conversion.hpp"
-#include "archive/ZelMatFile.hpp"
-#include "archive/ZelOptFile.hpp"
-#include "brdfs/BRDFs.hpp"
-#include "options/AllOptions.hpp"
-#include "options/RenderView.hpp"
-#include "params/AnimatedParams.hpp"
-#include "params/GeomMapChannel.hpp"
-#include "platform/Text.hpp"
-#include "textures/BitmapBuffer.hpp"
-#include "textures/Textures.hpp"
-#include "textures/UVWGenerators.hpp"
+#include <dexmor/files/ConversionContext.hpp>
+#include <dexmor/dexmor.hpp>
+#include <dexmor/files/ZelMatFile.hpp>
+#include <dexmor/files/ZelOptFile.hpp>
+#include <dexmor/brdfs/BRDFs.hpp>
+#include <dexmor/options/AllOptions.hpp>
+#include <dexmor/options/RenderView.hpp>
+#include <dexmor/params/AnimatedParams.hpp>
+#include <dexmor/params/GeomMapChannel.hpp>
+#include <dexmor/platform/Text.hpp>
+#include <dexmor/textures/BitmapBuffer.hpp>
+#include <dexmor/textures/Textures.hpp>
+#include <dexmor/textures/UVWGenerators.hpp>
 
 #include <gtest/gtest.h>
 
@@ -32,6 +33,7 @@
 #include <unistd.h>
 
 using namespace materialtest;
+using namespace testsupport;
 namespace fs = std::filesystem;
 
 namespace {
@@ -90,7 +92,7 @@ ByteVector optionsRecord(AllOptions& options) {
 class HostileInput : public LibraryTest {
 protected:
     void TearDown() override {
-        resetSharedDefaultSun(); // a refused sky record may have changed it
+        const ConversionContext fresh1; // a refused sky record may have changed it
         LibraryTest::TearDown();
     }
 };
@@ -374,7 +376,7 @@ TEST_F(HostileInput, EveryReaderFamilyNamesTheRecordAndOffsetOfItsFailure) {
         EXPECT_EQ(ar.failure()->recordPath, row.recordPath) << ar.failure()->describe();
         EXPECT_EQ(ar.failure()->offset, row.offset) << ar.failure()->describe();
         EXPECT_NE(ar.failure()->reason.find(row.reason), std::string::npos) << ar.failure()->describe();
-        resetSharedDefaultSun();
+        const ConversionContext fresh2;
     }
 }
 

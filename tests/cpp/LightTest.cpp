@@ -2,10 +2,11 @@
 // round trips, comparison, and the XML assets with the sun lights' naming.
 #include "TestSupport.hpp"
 
-#include "archive/Members.hpp"
-#include "lights/BaseLight.hpp"
-#include "lights/LightKinds.hpp"
-#include "lights/SunLight.hpp"
+#include <dexmor/archive/Members.hpp>
+#include <dexmor/files/ConversionContext.hpp>
+#include <dexmor/lights/BaseLight.hpp>
+#include <dexmor/lights/LightKinds.hpp>
+#include <dexmor/lights/SunLight.hpp>
 
 #include <boost/make_shared.hpp>
 #include <gtest/gtest.h>
@@ -320,6 +321,7 @@ TEST(LightXml, AssetsOfEveryKind) {
 }
 
 TEST(SunLightXml, OneAssetPerIdentifierNamedInWritingOrder) {
+    const ConversionContext context;
     std::string out;
     AssetXmlWriter writer(out);
     SunLight first("A", "{id-a}"), second("B", "{id-b}"), third("C", "{id-c}");
@@ -340,7 +342,7 @@ TEST(SunLightXml, OneAssetPerIdentifierNamedInWritingOrder) {
     third.writeXml(writer, "/Pine");
     EXPECT_NE(out.find("url=\"/SunLight2\""), std::string::npos);
     EXPECT_EQ(occurrences(out, "<Asset "), 3u);
-    EXPECT_EQ(writer.sunUrls(), (std::map<std::string, std::string>{
+    EXPECT_EQ(PerConversion<DocumentSunUrls>::current().urls, (std::map<std::string, std::string>{
                                     {"{id-a}", "/SunLight"}, {"{id-b}", "/SunLight1"}, {"{id-c}", "/SunLight2"}}));
     EXPECT_EQ(writer.depth(), 0u);
 }

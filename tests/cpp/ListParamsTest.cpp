@@ -2,9 +2,9 @@
 // every list class as a renderer makes them.
 #include "TestSupport.hpp"
 
-#include "params/GeomMapChannel.hpp"
-#include "params/NestedListParams.hpp"
-#include "params/SerialListParams.hpp"
+#include <dexmor/params/GeomMapChannel.hpp>
+#include <dexmor/params/NestedListParams.hpp>
+#include <dexmor/params/SerialListParams.hpp>
 
 #include <boost/make_shared.hpp>
 #include <gtest/gtest.h>

@@ -3,10 +3,10 @@
 // files of all three generations.
 #include "MaterialTestSupport.hpp"
 
-#include "archive/Conversion.hpp"
-#include "archive/ZelMatFile.hpp"
-#include "brdfs/BRDFs.hpp"
-#include "textures/Textures.hpp"
+#include <dexmor/dexmor.hpp>
+#include <dexmor/files/ZelMatFile.hpp>
+#include <dexmor/brdfs/BRDFs.hpp>
+#include <dexmor/textures/Textures.hpp>
 
 #include <cstring>
 #include <filesystem>
@@ -15,6 +15,7 @@
 #include <unistd.h>
 
 using namespace materialtest;
+using namespace testsupport;
 using testsupport::expectGolden;
 
 namespace {

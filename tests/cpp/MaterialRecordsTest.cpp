@@ -3,9 +3,9 @@
 // the walks that must stop (cycles through the library, very deep trees).
 #include "MaterialTestSupport.hpp"
 
-#include "brdfs/BRDFs.hpp"
-#include "textures/BitmapBuffer.hpp"
-#include "textures/Textures.hpp"
+#include <dexmor/brdfs/BRDFs.hpp>
+#include <dexmor/textures/BitmapBuffer.hpp>
+#include <dexmor/textures/Textures.hpp>
 
 #include <climits>
 #include <functional>

@@ -3,7 +3,7 @@
 // named materials of any kind, and the byte images of TextureTestSupport.
 #include "TextureTestSupport.hpp"
 
-#include "materials/Materials.hpp"
+#include <dexmor/materials/Materials.hpp>
 
 #include <boost/make_shared.hpp>
 #include <gtest/gtest.h>

@@ -3,9 +3,9 @@
 // field out of place in a record table shows up as a wrong value or wrong bytes.
 #include "TestSupport.hpp"
 
-#include "options/OrvexFrameData.hpp"
-#include "options/OrvexParams.hpp"
-#include "options/OrvexVFBStampInfo.hpp"
+#include <dexmor/options/OrvexFrameData.hpp>
+#include <dexmor/options/OrvexParams.hpp>
+#include <dexmor/options/OrvexVFBStampInfo.hpp>
 
 #include <gtest/gtest.h>
 

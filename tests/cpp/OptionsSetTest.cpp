@@ -5,9 +5,10 @@
 // a row out of place or with a wrong first version shows up as wrong bytes.
 #include "TestSupport.hpp"
 
-#include "archive/ZelOptFile.hpp"
-#include "options/AllOptions.hpp"
-#include "textures/SkyTexture.hpp"
+#include <dexmor/files/ConversionContext.hpp>
+#include <dexmor/files/ZelOptFile.hpp>
+#include <dexmor/options/AllOptions.hpp>
+#include <dexmor/textures/SkyTexture.hpp>
 
 #include <gtest/gtest.h>
 
@@ -163,7 +164,7 @@ std::string differenceOf(const AllOptions& a, const AllOptions& b) {
 TEST(AllOptions, RandomSetsRoundTripAtVersion23) {
     std::mt19937 rng(230023);
     for (int round = 0; round < 6; ++round) {
-        resetSharedDefaultSun();
+        const ConversionContext fresh1;
         AllOptions source = randomOptions(rng);
         QuickArchive written;
         ASSERT_TRUE(source.writeToArchive(written));
@@ -181,7 +182,7 @@ TEST(AllOptions, RandomSetsRoundTripAtVersion23) {
 
 TEST(AllOptions, OlderRecordsReadWithDefaultsForTheRowsTheyLack) {
     std::mt19937 rng(1999);
-    resetSharedDefaultSun();
+    const ConversionContext fresh2;
     AllOptions source = randomOptions(rng);
     source.reflect_tex = createTexture(BaseTexture::kChecker);
     for (const unsigned version : kAcceptedVersions) {
@@ -290,7 +291,7 @@ TEST(AllOptions, AnOptionsFileConvertsToTheDocumentOfItsSet) {
     const fs::path dir = fs::temp_directory_path() / ("dexmor-options-" + std::to_string(::getpid()));
     fs::create_directories(dir);
     std::mt19937 rng(77);
-    resetSharedDefaultSun();
+    const ConversionContext fresh3;
     AllOptions o = randomOptions(rng);
     o.gi_tex = createTexture(BaseTexture::kSky);
     o.reflect_tex = createTexture(BaseTexture::kSky);
@@ -298,14 +299,14 @@ TEST(AllOptions, AnOptionsFileConvertsToTheDocumentOfItsSet) {
     ASSERT_TRUE(ZelOptFile().writeFile(o, path));
     EXPECT_EQ(fs::file_size(path) % 4096, 0u);
 
-    const std::string converted = ZelOptFile().toXml(path);
+    const std::string converted = convertToXml(FileKind::RenderOptions, path);
     std::string direct;
     AssetXmlWriter writer(direct);
     writer.beginDocument();
     o.writeXml(writer, "");
     writer.endDocument();
     EXPECT_EQ(converted, direct);
-    EXPECT_EQ(converted, ZelOptFile().toXml(path)); // nothing carries over between conversions
+    EXPECT_EQ(converted, convertToXml(FileKind::RenderOptions, path)); // nothing carries over between conversions
 
     // A record the set rejects passes the file through as text: its bytes up to
     // the first zero byte, here the version word's low half.
@@ -313,6 +314,6 @@ TEST(AllOptions, AnOptionsFileConvertsToTheDocumentOfItsSet) {
     const VersionWord word = VersionWord::make(1, 12);
     std::memcpy(version12.data(), &word.raw, 4);
     std::ofstream(dir / "old.zelopt", std::ios::binary) << version12;
-    EXPECT_EQ(ZelOptFile().toXml(dir / "old.zelopt"), "\x01");
+    EXPECT_EQ(convertToXml(FileKind::RenderOptions, dir / "old.zelopt"), "\x01");
     fs::remove_all(dir);
 }

@@ -1,6 +1,6 @@
 // The renderer's parameter interface: plain answers, extension interfaces, the
 // typed lists and the parameter tracker.
-#include "params/PluginParameter.hpp"
+#include <dexmor/params/PluginParameter.hpp>
 
 #include <gtest/gtest.h>
 

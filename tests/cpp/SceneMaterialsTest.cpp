@@ -2,7 +2,7 @@
 // material, its record, and use from several threads.
 #include "MaterialTestSupport.hpp"
 
-#include "brdfs/BRDFs.hpp"
+#include <dexmor/brdfs/BRDFs.hpp>
 
 #include <atomic>
 #include <sstream>

@@ -2,8 +2,9 @@
 // documents, and what single parameters show for chosen values.
 #include "TestSupport.hpp"
 
-#include "options/AllOptions.hpp"
-#include "textures/SkyTexture.hpp"
+#include <dexmor/files/ConversionContext.hpp>
+#include <dexmor/options/AllOptions.hpp>
+#include <dexmor/textures/SkyTexture.hpp>
 
 #include <gtest/gtest.h>
 
@@ -45,7 +46,7 @@ std::string parameterOf(const std::string& xml, const std::string& url, const st
 } // namespace
 
 TEST(Settings, DefaultDocumentGolden) {
-    resetSharedDefaultSun();
+    const ConversionContext fresh1;
     AllOptions options;
     const std::string xml = documentOf(options);
     expectGolden(xml, "options_default.xml");
@@ -53,7 +54,7 @@ TEST(Settings, DefaultDocumentGolden) {
 }
 
 TEST(Settings, EnvironmentTexturesGolden) {
-    resetSharedDefaultSun();
+    const ConversionContext fresh2;
     AllOptions options;
     options.bg_tex = createTexture(BaseTexture::kChecker), options.gi_tex = createTexture(BaseTexture::kSky);
     options.reflect_tex = createTexture(BaseTexture::kSky), options.refract_tex = createTexture(BaseTexture::kFresnel);

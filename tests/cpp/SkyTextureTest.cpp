@@ -2,7 +2,8 @@
 // (per conversion and per thread) and its XML with the document's sun map.
 #include "TestSupport.hpp"
 
-#include "textures/SkyTexture.hpp"
+#include <dexmor/files/ConversionContext.hpp>
+#include <dexmor/textures/SkyTexture.hpp>
 
 #include <boost/make_shared.hpp>
 #include <gtest/gtest.h>
@@ -20,7 +21,7 @@ namespace {
 // Every sky test starts from a pristine default sun, as every conversion does.
 class Sky : public ::testing::Test {
 protected:
-    void SetUp() override { resetSharedDefaultSun(); }
+    ConversionContext context;
 };
 using SkyXml = Sky;
 
@@ -114,7 +115,7 @@ TEST_F(Sky, Version3OverwritesTheSharedDefaultSunAndCanPointAtIt) {
     const ByteVector bytes = recordOf(writer);
     EXPECT_EQ(bytes.back(), 1); // its sun is the default sun
 
-    resetSharedDefaultSun();
+    const ConversionContext fresh1;
     EXPECT_EQ(sharedDefaultSun()->turbidity, 3.0f);
     SkyTexture read;
     ASSERT_TRUE(readInto(read, bytes));
@@ -125,7 +126,7 @@ TEST_F(Sky, Version3OverwritesTheSharedDefaultSunAndCanPointAtIt) {
     SkyTexture later;
     EXPECT_EQ(sunOf(later).turbidity, 7.5f);
     // ... and the next conversion starts from a pristine one.
-    resetSharedDefaultSun();
+    const ConversionContext fresh2;
     SkyTexture next;
     EXPECT_EQ(sunOf(next).turbidity, 3.0f);
     EXPECT_NE(next.sun.get(), read.sun.get());
@@ -136,7 +137,7 @@ TEST_F(Sky, ConvertingOneFileDoesNotChangeTheNextOne) {
     // File B: a version-1 sky without a sun, so it shows the default sun.
     const ByteVector fileB = Image{}.version(0, 1).flag(false).bytes;
     auto convert = [](const ByteVector& bytes) {
-        resetSharedDefaultSun(); // as every conversion does
+        const ConversionContext fresh3; // as every conversion does
         SkyTexture sky;
         EXPECT_TRUE(readInto(sky, bytes));
         return xmlOf(sky, "/m/sky");
@@ -147,7 +148,7 @@ TEST_F(Sky, ConvertingOneFileDoesNotChangeTheNextOne) {
     sharedDefaultSun()->intensity_multiplier = 42;
     SkyTexture skyA;
     const ByteVector fileA = recordOf(skyA);
-    resetSharedDefaultSun();
+    const ConversionContext fresh4;
     const std::string a = convert(fileA);
     EXPECT_NE(a.find("<value>42</value>"), std::string::npos);
 

@@ -2,9 +2,11 @@
 // Helpers shared by the record tests: byte images assembled by hand, the record an
 // object writes, reading records back, a check that every stored byte takes part in
 // comparison, and golden documents.
-#include "archive/QuickArchive.hpp"
-#include "params/AnimatedValues.hpp"
-#include "xml/AssetXmlWriter.hpp"
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/dexmor.hpp>
+#include <dexmor/files/ConversionContext.hpp>
+#include <dexmor/params/AnimatedValues.hpp>
+#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <gtest/gtest.h>
 
@@ -21,6 +23,32 @@
 #include <vector>
 
 namespace testsupport {
+
+// The whole document of a conversion into a string (a library is read once).
+inline std::string convertToXml(OrvexKavorCore::FileKind kind, const OrvexKavorCore::Input& input) {
+    std::string xml;
+    OrvexKavorCore::StringSink sink(xml);
+    OrvexKavorCore::convert(kind, input, sink);
+    return xml;
+}
+inline std::string convertBytesToXml(OrvexKavorCore::FileKind kind, std::string_view bytes) {
+    return convertToXml(kind, OrvexKavorCore::Input::ofBytes(bytes));
+}
+// The pieces a destination that cannot take back receives (a library is read twice).
+inline std::vector<std::string> streamedPieces(OrvexKavorCore::FileKind kind, std::string_view bytes) {
+    std::vector<std::string> pieces;
+    OrvexKavorCore::CallbackSink sink([&pieces](std::string_view piece) { pieces.emplace_back(piece); });
+    OrvexKavorCore::convert(kind, OrvexKavorCore::Input::ofBytes(bytes), sink);
+    return pieces;
+}
+inline std::string streamedXml(OrvexKavorCore::FileKind kind, std::string_view bytes) {
+    std::string xml;
+    for (const std::string& piece : streamedPieces(kind, bytes)) xml += piece;
+    return xml;
+}
+inline OrvexKavorCore::Diagnosis diagnoseBytes(OrvexKavorCore::FileKind kind, std::string_view bytes) {
+    return OrvexKavorCore::diagnose(kind, OrvexKavorCore::Input::ofBytes(bytes));
+}
 
 using ByteVector = std::vector<std::uint8_t>;
 using OrvexKavorCore::QuickArchive;
@@ -110,6 +138,9 @@ inline std::string failureOf(const QuickArchive& ar) { return ar.failure() ? ar.
 // The XML of one object written under `url`; the writer's depth returns to 0.
 template <class Object>
 std::string xmlOf(Object& object, const std::string& url) {
+    // A document of its own: its sun assets are written anew.
+    OrvexKavorCore::DocumentSunUrls suns;
+    OrvexKavorCore::PerConversion<OrvexKavorCore::DocumentSunUrls>::Use document(suns);
     std::string out;
     OrvexKavorCore::AssetXmlWriter writer(out);
     object.writeXml(writer, url);

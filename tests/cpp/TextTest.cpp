@@ -1,6 +1,6 @@
 // Text at the edges: validation of UTF-8, the Windows-1252 fallback, counting in
 // UTF-16 code units, and ASCII-only case folding.
-#include "platform/Text.hpp"
+#include <dexmor/platform/Text.hpp>
 
 #include <gtest/gtest.h>
 

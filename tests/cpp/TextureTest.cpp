@@ -2,9 +2,9 @@
 // versions, member checks, the XML assets, colour inversion and deep trees.
 #include "TestSupport.hpp"
 
-#include "textures/BitmapBuffer.hpp"
-#include "textures/Textures.hpp"
-#include "textures/UVWGenerators.hpp"
+#include <dexmor/textures/BitmapBuffer.hpp>
+#include <dexmor/textures/Textures.hpp>
+#include <dexmor/textures/UVWGenerators.hpp>
 
 #include <boost/make_shared.hpp>
 #include <gtest/gtest.h>

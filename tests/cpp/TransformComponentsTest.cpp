@@ -1,7 +1,7 @@
 // Transform components: their record, the matrices built from them, comparison.
 #include "TestSupport.hpp"
 
-#include "params/TransformComponents.hpp"
+#include <dexmor/params/TransformComponents.hpp>
 
 #include <gtest/gtest.h>
 

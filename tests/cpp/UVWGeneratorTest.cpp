@@ -2,7 +2,7 @@
 // comparison and the XML assets.
 #include "TestSupport.hpp"
 
-#include "textures/UVWGenerators.hpp"
+#include <dexmor/textures/UVWGenerators.hpp>
 
 #include <boost/make_shared.hpp>
 #include <gtest/gtest.h>

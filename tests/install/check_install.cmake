@@ -41,11 +41,23 @@ file(MAKE_DIRECTORY ${WORK_DIR})
 
 # 1. Install.
 run(${CMAKE_COMMAND} --install ${BUILD_DIR} --prefix ${prefix})
-foreach(file include/dexmor/archive/Conversion.hpp include/dexmor/archive/ZelMatFile.hpp share/man/man1/dexmor.1)
+foreach(file include/dexmor/dexmor.hpp include/dexmor/version.hpp include/dexmor/files/ZelMatFile.hpp
+             share/man/man1/dexmor.1)
   if(NOT EXISTS ${prefix}/${file})
     message(FATAL_ERROR "not installed: ${file}")
   endif()
 endforeach()
+# Internal helpers stay private.
+foreach(file include/dexmor/platform/FileIo.hpp include/dexmor/platform/HugePages.hpp
+             include/dexmor/xml/NumberFormat.hpp include/dexmor/options/RecordEncodings.hpp)
+  if(EXISTS ${prefix}/${file})
+    message(FATAL_ERROR "a private header was installed: ${file}")
+  endif()
+endforeach()
+file(READ ${prefix}/share/man/man1/dexmor.1 manual LIMIT 200)
+if(NOT manual MATCHES "Dexmor ${VERSION}")
+  message(FATAL_ERROR "the manual page does not name version ${VERSION}")
+endif()
 
 # 2. The installed tool gives the reference document.
 execute_process(COMMAND ${prefix}/bin/dexmor xml ${SAMPLE} RESULT_VARIABLE status

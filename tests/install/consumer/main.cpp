@@ -1,5 +1,6 @@
 // consumer FILE: writes the XML of FILE (kind by its extension) to standard output.
-#include "archive/Conversion.hpp"
+// It includes the front header only, as a program converting files does.
+#include <dexmor/dexmor.hpp>
 
 #include <cstdio>
 #include <optional>
@@ -9,6 +10,10 @@ int main(int argc, char** argv) {
     if (argc != 2) return 2;
     const std::optional<OrvexKavorCore::FileKind> kind = OrvexKavorCore::fileKindOf(argv[1]);
     if (!kind) return 2;
-    const std::string xml = OrvexKavorCore::convertToXml(*kind, argv[1]);
-    return std::fwrite(xml.data(), 1, xml.size(), stdout) == xml.size() ? 0 : 1;
+    bool written = true;
+    OrvexKavorCore::CallbackSink out([&written](std::string_view piece) {
+        written = written && std::fwrite(piece.data(), 1, piece.size(), stdout) == piece.size();
+    });
+    OrvexKavorCore::convert(*kind, argv[1], out);
+    return written ? 0 : 1;
 }

@@ -1,0 +1,39 @@
+#pragma once
+// The conversion of a material library: its document is one "<Assets>" block
+// per material that gives an asset, streamed to the sink as it is written.
+#include <dexmor/dexmor.hpp>
+#include <dexmor/files/ConversionContext.hpp>
+#include <dexmor/files/ZelMatFile.hpp>
+
+namespace OrvexKavorCore {
+
+class LibraryConversion {
+public:
+    LibraryConversion(ConversionContext& context, const SharedBytes& bytes) : context_(context), bytes_(bytes) {}
+
+    // Reads every material, each dropped as soon as it has read.
+    Diagnosis readThrough();
+    // Writes the document to `sink`; when the bytes do not read as a library,
+    // nothing stays in the sink and the result says why.
+    Diagnosis writeTo(DocumentSink& sink);
+
+private:
+    // How a single reading of a library ended.
+    enum class SingleReading {
+        Written,     // the whole document was written
+        NotALibrary, // the bytes do not read as a library
+        SunChanged,  // a sky record after the first material changed the default sun
+    };
+    SingleReading writeReadingOnce(DocumentSink& sink, Diagnosis& result);
+    // Reads the library through, then again writing each material: nothing is
+    // sent for bytes that do not read.
+    void writeReadingTwice(DocumentSink& sink, Diagnosis& result);
+    // Frames the bytes and reads every material, handing each to `take`; false,
+    // with the failure in `result`, at the first that does not read.
+    bool readMaterials(Diagnosis& result, const std::function<void(MaterialPtr&&)>& take);
+
+    ConversionContext& context_;
+    const SharedBytes& bytes_;
+};
+
+} // namespace OrvexKavorCore

@@ -1,0 +1,75 @@
+#pragma once
+// Nested members of a record. A mandatory member is stored as its Int32 kind id
+// followed by its own record; an optional member is a Bool "present" flag, then,
+// when present, the kind id and the record. The family of a member (material,
+// BRDF, texture, UVW generator, bitmap, light) gives its creation function through
+// Family<Base>, which each family header specialises.
+#include <dexmor/archive/QuickArchive.hpp>
+
+#include <boost/shared_ptr.hpp>
+
+#include <cstdint>
+#include <string>
+
+namespace OrvexKavorCore {
+
+// Specialised by each family base:
+//   static constexpr const char* word;                        // "texture"
+//   static boost::shared_ptr<Base> create(std::int32_t kind);  // empty for unknown ids
+template <class Base>
+struct Family;
+
+// Reads a mandatory member: its kind id, a new object of that kind put into
+// `member`, then the object's record. `name` and `index` label the member in
+// failure reports ("texture color_tex", "BRDF layer 2").
+template <class Base>
+bool readMember(QuickArchive& ar, boost::shared_ptr<Base>& member, const char* name = nullptr,
+                std::int64_t index = -1) {
+    QuickArchive::Scope scope(ar, Family<Base>::word, name, index);
+    if (!scope) return false;
+    const auto kind = ar.get<std::int32_t>();
+    boost::shared_ptr<Base> object = Family<Base>::create(kind);
+    if (!object) return ar.fail(std::string("unknown ") + Family<Base>::word + " kind " + std::to_string(kind));
+    member = object;
+    return object->readFromArchive(ar);
+}
+
+// Reads an optional member: Bool present, then (when present) as readMember.
+// An absent member leaves `member` empty.
+template <class Base>
+bool readOptionalMember(QuickArchive& ar, boost::shared_ptr<Base>& member, const char* name = nullptr) {
+    if (!ar.get<bool>()) {
+        member.reset();
+        return true;
+    }
+    return readMember(ar, member, name);
+}
+
+// Writes a mandatory member; an empty member cannot be written.
+template <class Base>
+bool writeMember(QuickArchive& ar, const boost::shared_ptr<Base>& member) {
+    if (!member) return false;
+    ar.write(static_cast<std::int32_t>(member->kindId()));
+    return member->writeToArchive(ar);
+}
+
+template <class Base>
+bool writeOptionalMember(QuickArchive& ar, const boost::shared_ptr<Base>& member) {
+    ar.write(static_cast<bool>(member));
+    return !member || writeMember(ar, member);
+}
+
+// Both absent, or both present and equal by the family's own comparison.
+template <class Base>
+bool membersEqual(const boost::shared_ptr<Base>& a, const boost::shared_ptr<Base>& b) {
+    if (!a) return !b;
+    return a->isEqual(b);
+}
+
+// The deep copy of a member, or an empty pointer.
+template <class Base>
+boost::shared_ptr<Base> cloneMember(const boost::shared_ptr<Base>& member) {
+    return member ? member->clone() : boost::shared_ptr<Base>();
+}
+
+} // namespace OrvexKavorCore

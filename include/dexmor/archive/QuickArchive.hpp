@@ -1,0 +1,228 @@
+#pragma once
+// QuickArchive: the byte container every stored object passes through.
+//
+// Bytes live in fixed 4096-byte chunks (chunk k holds bytes 4096k..4096k+4095), so
+// appending never moves stored bytes. Reading and writing have independent
+// positions. Every value is stored little-endian and packed, with no type
+// information: the records of the classes give the bytes their meaning.
+//
+// Reading is defensive. A plain value read past the last chunk leaves its
+// destination as it was (the old format's behaviour, relied on by truncated
+// records). A count-prefixed value or a list whose count cannot fit in the bytes
+// that remain fails at once, without allocating by that count. Nesting is limited
+// by Scope. The first failure is kept with its offset and record path so that the
+// user can be told why a file did not read.
+#include <dexmor/platform/KavorTypes.hpp>
+#include <dexmor/archive/ReadFailure.hpp>
+#include <dexmor/platform/SharedBytes.hpp>
+
+#include <boost/array.hpp>
+#include <boost/shared_ptr.hpp>
+
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+#include <filesystem>
+#include <iosfwd>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace OrvexKavorCore {
+
+// Two small numbers packed into one UInt32: the first in the low 16 bits, the
+// second in the high 16 bits.
+struct VersionWord {
+    std::uint32_t raw = 0;
+
+    static constexpr VersionWord make(std::uint16_t first, std::uint16_t second) {
+        return VersionWord{static_cast<std::uint32_t>(first) | (static_cast<std::uint32_t>(second) << 16)};
+    }
+    constexpr std::uint16_t first() const { return static_cast<std::uint16_t>(raw & 0xFFFF); }
+    constexpr std::uint16_t second() const { return static_cast<std::uint16_t>(raw >> 16); }
+    constexpr bool is(std::uint16_t a, std::uint16_t b) const { return raw == make(a, b).raw; }
+    friend constexpr bool operator==(VersionWord, VersionWord) = default;
+};
+
+class QuickArchive {
+public:
+    static constexpr std::size_t kChunkSize = 4096;
+    static constexpr unsigned kMaxNesting = 256;
+    // Positions are 32-bit in the format: archives of 4 GiB or more are refused.
+    static constexpr std::uint64_t kMaxSize = std::uint64_t{1} << 32;
+
+    using Chunk = boost::array<std::uint8_t, kChunkSize>;
+
+    // An empty archive with `initialChunks` zeroed chunks.
+    explicit QuickArchive(std::size_t initialChunks = 1);
+    // An archive holding exactly these bytes, read position 0, write position at
+    // the end. Buffers of 4 GiB or more give an empty archive marked as failed.
+    QuickArchive(const void* data, std::size_t length);
+    // An archive over `length` bytes of `owner` from `offset`, without copying them:
+    // every whole chunk is a view into the bytes, whose owner the archive keeps alive; a
+    // trailing partial chunk is copied and zero-padded. For reading only: a write
+    // would change the owner's bytes. Out-of-range spans give a failed, empty archive.
+    static QuickArchive viewOf(const SharedBytes& bytes, std::size_t offset, std::size_t length);
+    virtual ~QuickArchive();
+
+    QuickArchive(const QuickArchive&) = default; // shares the chunks
+    QuickArchive& operator=(const QuickArchive&) = default;
+
+    // Drops every chunk and both positions; the failure record too.
+    void reset();
+
+    // --- positions and size ---
+    std::uint64_t readPosition() const { return readPos_; }
+    std::uint64_t writePosition() const { return writePos_; }
+    std::size_t chunkCount() const { return chunks_.size(); }
+    // Bytes that can still be read: every byte of every existing chunk counts.
+    std::uint64_t remaining() const;
+    // Whether `count` items of at least `itemSize` bytes each can still be read.
+    bool canHold(std::uint64_t count, std::uint64_t itemSize) const;
+    // Advances the read position without reading.
+    void skip(std::uint64_t bytes);
+
+    // --- bytes ---
+    void putByte(std::uint8_t b);
+    bool getByte(std::uint8_t& b);
+    void putRaw(const void* data, std::size_t length);
+    // Reads `length` bytes; bytes past the last chunk leave the destination as it was.
+    // True when every byte was delivered.
+    bool getRaw(void* data, std::size_t length) {
+        // Most values lie inside one chunk: copy them at once.
+        const std::uint64_t index = readPos_ / kChunkSize;
+        const std::size_t offset = static_cast<std::size_t>(readPos_ % kChunkSize);
+        if (index < chunks_.size() && length <= kChunkSize - offset) {
+            std::memcpy(data, chunks_[index]->data() + offset, length);
+            readPos_ += length;
+            return true;
+        }
+        return getRawAcrossChunks(data, length);
+    }
+
+    // --- primitives (little-endian, packed) ---
+    void write(bool v) { putByte(v ? 1 : 0); }
+    void write(std::uint8_t v) { putByte(v); }
+    void write(std::int32_t v) { putRaw(&v, sizeof v); }
+    void write(std::uint32_t v) { putRaw(&v, sizeof v); }
+    void write(float v) { putRaw(&v, sizeof v); }
+    void write(double v) { putRaw(&v, sizeof v); }
+    void write(const Vector& v);
+    void write(const Color& v);
+    void write(const AColor& v);
+    void write(const Matrix& v);
+    void write(const Transform& v);
+    void write(VersionWord v) { write(v.raw); }
+
+    // A stored Bool byte other than 0 reads as true.
+    void read(bool& v);
+    void read(std::uint8_t& v) { getByte(v); }
+    void read(std::int32_t& v) { getRaw(&v, sizeof v); }
+    void read(std::uint32_t& v) { getRaw(&v, sizeof v); }
+    void read(float& v) { getRaw(&v, sizeof v); }
+    void read(double& v) { getRaw(&v, sizeof v); }
+    // The compound values assemble into a zeroed temporary: missing bytes read as 0.
+    void read(Vector& v);
+    void read(Color& v);
+    void read(AColor& v);
+    void read(Matrix& v);
+    void read(Transform& v);
+    void read(VersionWord& v) { read(v.raw); }
+
+    // Reads a value into a fresh zero-initialised local and returns it.
+    template <class T>
+    T get() {
+        T v{};
+        read(v);
+        return v;
+    }
+
+    // --- count-prefixed values ---
+    // String: UInt32 N, then N bytes, no terminator. Read back up to the first NUL.
+    void writeString(std::string_view narrow);
+    [[nodiscard]] bool readString(std::string& out);
+    // WString: text stored as the String of its UTF-8 form (up to its first NUL;
+    // text that is not valid UTF-8 is stored empty). Reading decodes strict UTF-8,
+    // falling back to Windows-1252.
+    void writeWString(std::string_view utf8);
+    [[nodiscard]] bool readWString(std::string& out);
+    // Bytes: UInt32 N, then N raw bytes.
+    void writeBytes(const void* data, std::uint32_t length);
+    // Reads a Bytes block into a buffer of `capacity` bytes and returns the stored
+    // count N (see the .cpp for the strictness rule). A count that cannot fit in
+    // the remaining bytes fails and returns nullopt.
+    [[nodiscard]] std::optional<std::uint32_t> readBytes(void* buffer, std::uint32_t capacity, bool strict);
+
+    // --- whole archive ---
+    // Chunk count (UInt32) then every chunk in full.
+    bool save(std::ostream& out) const;
+    // Replaces the content with a chunk image read from the stream; both positions 0.
+    // False when the stream ends before the count or inside a chunk.
+    bool load(std::istream& in);
+    bool saveToFile(const std::filesystem::path& path) const;
+    bool loadFromFile(const std::filesystem::path& path);
+    // Every chunk, in full, in order (the options file stores just these).
+    const std::vector<boost::shared_ptr<Chunk>>& chunks() const { return chunks_; }
+
+    // --- failures ---
+    // Records `reason` as the failure if none is recorded yet; returns false so that
+    // readers can write `return ar.fail("...")`.
+    bool fail(std::string_view reason);
+    bool failed() const { return failure_.has_value(); }
+    const std::optional<ReadFailure>& failure() const { return failure_; }
+    // For readers that deliberately ignore a member's failure.
+    void clearFailure() { failure_.reset(); }
+
+    // One level of the record path, and the nesting guard. A reader opens a Scope
+    // before reading a nested member; when the nesting is too deep the scope is
+    // false and the failure is recorded.
+    class Scope {
+    public:
+        // A nested member: counts towards the nesting limit.
+        Scope(QuickArchive& ar, const char* what, const char* name = nullptr, std::int64_t index = -1)
+            : Scope(ar, what, name, index, true) {}
+        // A label only (a field of a flat record): does not count as nesting.
+        static Scope label(QuickArchive& ar, const char* name) { return Scope(ar, nullptr, name, -1, false); }
+        ~Scope() {
+            if (nests_) --ar_.nesting_;
+            if (pushed_) ar_.frames_.pop_back();
+        }
+        Scope(const Scope&) = delete;
+        Scope& operator=(const Scope&) = delete;
+        explicit operator bool() const { return ok_; }
+
+    private:
+        Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index, bool nests)
+            : ar_(ar), nests_(nests), pushed_(ar.frames_.size() < kMaxNesting), ok_(true) {
+            // The path is kept only up to the limit: deeper frames add nothing a user needs.
+            if (pushed_) ar_.frames_.push_back(Frame{what, name, index});
+            if (nests_ && ++ar_.nesting_ > kMaxNesting) tooDeep();
+        }
+        void tooDeep();
+        QuickArchive& ar_;
+        bool nests_;
+        bool pushed_;
+        bool ok_;
+    };
+
+private:
+    struct Frame {
+        const char* what;
+        const char* name;
+        std::int64_t index;
+    };
+
+    Chunk& chunkFor(std::uint64_t position);
+    bool getRawAcrossChunks(void* data, std::size_t length);
+    std::string recordPath() const;
+
+    std::vector<boost::shared_ptr<Chunk>> chunks_;
+    std::uint64_t readPos_ = 0;
+    std::uint64_t writePos_ = 0;
+    std::vector<Frame> frames_;
+    unsigned nesting_ = 0;
+    std::optional<ReadFailure> failure_;
+};
+
+} // namespace OrvexKavorCore

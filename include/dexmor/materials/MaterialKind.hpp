@@ -1,0 +1,250 @@
+#pragma once
+// What the material kinds share.
+//
+// A material kind is described beside its class by
+//   - kInfo: its kind id, the record version it writes (readers accept 1 to that
+//     version), its plugin type, whether its reader resets the object first, and
+//     whether its reset takes a new default name;
+//   - fields(): its record as a table (archive/Record.hpp), each item stored from
+//     some record version on. Besides plain values the items can be members
+//     (material::Optional / Required / List), the base record and the name item
+//     of older records (material::baseRecord / nameItem).
+// From these follow, once for all kinds:
+//   record:     VersionWord (0, version), then the items of that version in table
+//               order. Writing is refused, before anything is written, while a
+//               member the record requires is missing (canBeWritten()).
+//   reading:    the version word, a reset when kInfo asks for one (otherwise the
+//               record is read over the current fields, and lists append), then
+//               the items the stored version holds.
+//   comparison: same kind, then every item of the table equal: members by their
+//               own comparison (both absent counts as equal), values exactly; the
+//               name and identifier are never compared.
+//   copies:     the copy constructor shares the members; clone() and
+//               cloneRenamed() then let the kind separate what it deep-copies
+//               (separate(renamed)); a copy that cannot be completed (a tree
+//               deeper than the walk limit) is empty. cloneRenamed() gives the
+//               copy the library's unique name for the source's name.
+// Kinds with irregular old records hide readVersion(); the reference material,
+// which looks its target up while writing, writes its record by hand.
+#include <dexmor/archive/Members.hpp>
+#include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/archive/Record.hpp>
+#include <dexmor/brdfs/Base_BRDF.hpp>
+#include <dexmor/materials/BaseMaterial.hpp>
+#include <dexmor/textures/BaseTexture.hpp>
+
+#include <boost/make_shared.hpp>
+#include <boost/shared_ptr.hpp>
+
+#include <cstdint>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace OrvexKavorCore {
+
+class AssetXmlWriter;
+
+struct MaterialKindInfo {
+    std::int32_t kind;
+    std::uint16_t version;  // the record version written; readers accept 1 to it
+    const char* pluginType; // "MtlBump"; empty for kinds that stand for other materials
+    const char* what;       // the kind in failure reports ("bump material")
+    bool resetBeforeRead;   // the reader resets first, so missing fields keep defaults
+    bool resetTakesName;    // the reset also takes a fresh default name (the base reset)
+};
+
+namespace material {
+
+// A member behind a Bool present flag.
+template <class Ptr>
+struct Optional {
+    static bool read(QuickArchive& ar, Ptr& p) { return readOptionalMember(ar, p); }
+    static bool write(QuickArchive& ar, const Ptr& p) { return writeOptionalMember(ar, p); }
+    static bool equal(const Ptr& a, const Ptr& b) { return membersEqual(a, b); }
+};
+
+// A member stored as its kind id and record, without a flag.
+template <class Ptr>
+struct Required {
+    static bool read(QuickArchive& ar, Ptr& p) { return readMember(ar, p); }
+    static bool write(QuickArchive& ar, const Ptr& p) { return writeMember(ar, p); }
+    static bool equal(const Ptr& a, const Ptr& b) { return membersEqual(a, b); }
+};
+
+// A list of required members: UInt32 count, then the items. Reading appends
+// each item that reads. A member record takes at least its kind id and a version word, so a
+// count that cannot fit in the remaining bytes fails at once.
+template <class Ptr>
+struct List {
+    static bool read(QuickArchive& ar, std::vector<Ptr>& list) {
+        const auto count = ar.get<std::uint32_t>();
+        if (!ar.canHold(count, 8)) return ar.fail("a list of " + std::to_string(count) + " cannot fit in the data");
+        for (std::uint32_t i = 0; i < count; ++i) {
+            Ptr item;
+            if (!readMember(ar, item, nullptr, i)) return false;
+            list.push_back(std::move(item));
+        }
+        return true;
+    }
+    static bool write(QuickArchive& ar, const std::vector<Ptr>& list) {
+        ar.write(static_cast<std::uint32_t>(list.size()));
+        for (const Ptr& item : list)
+            if (!writeMember(ar, item)) return false;
+        return true;
+    }
+    static bool equal(const std::vector<Ptr>& a, const std::vector<Ptr>& b) {
+        if (a.size() != b.size()) return false;
+        for (std::size_t i = 0; i < a.size(); ++i)
+            if (!membersEqual(a[i], b[i])) return false;
+        return true;
+    }
+};
+
+// A list of texts: UInt32 count, then that many WStrings. Reading replaces the list.
+struct TextList {
+    static bool read(QuickArchive& ar, std::vector<std::string>& list);
+    static bool write(QuickArchive& ar, const std::vector<std::string>& list);
+    static bool equal(const std::vector<std::string>& a, const std::vector<std::string>& b) { return a == b; }
+};
+
+// The base record at its place in a kind's record. Never compared.
+template <class Obj>
+constexpr record::Field<Obj> baseRecord(record::Versions versions = record::always()) {
+    return record::Field<Obj>{
+        "base record",
+        versions,
+        [](QuickArchive& ar, Obj& o) { return o.readBaseRecord(ar); },
+        [](QuickArchive& ar, Obj& o) { return o.writeBaseRecord(ar); },
+        [](const Obj&, const Obj&) { return true; },
+    };
+}
+
+// The name item of older records (see BaseMaterial::readNameItem). Never compared.
+template <class Obj>
+constexpr record::Field<Obj> nameItem(record::Versions versions) {
+    return record::Field<Obj>{
+        "name",
+        versions,
+        [](QuickArchive& ar, Obj& o) { return o.readNameItem(ar); },
+        [](QuickArchive& ar, Obj& o) {
+            ar.writeWString(o.name);
+            return true;
+        },
+        [](const Obj&, const Obj&) { return true; },
+    };
+}
+
+// Opens a material's asset (asset type "material"), its plugin (name
+// `pluginType`) and its parameter list; endAsset closes them.
+void beginAsset(AssetXmlWriter& writer, std::string_view url, std::string_view layout, std::string_view pluginType);
+void endAsset(AssetXmlWriter& writer);
+
+// "unknown <what> version (a, b)"; returns false.
+bool refuseVersion(QuickArchive& ar, const char* what, VersionWord version);
+
+// Replace a member by its own copy: a sub-material by its clone() or (renamed)
+// cloneRenamed(), a texture or BRDF layer by its clone(). False when a present
+// member could not be copied (a tree deeper than the walk limit).
+bool copyMember(MaterialPtr& m, bool renamed);
+bool copyMember(TexturePtr& t);
+bool copyMember(BRDFPtr& b);
+
+// The library's unique name for `source`.
+std::string uniqueName(const std::string& source);
+
+// The own asset of a sub-material or texture, when there is one.
+inline void writeAssetOf(AssetXmlWriter& writer, const MaterialPtr& m, const std::string& url) {
+    if (m) m->writeXml(writer, url);
+}
+inline void writeAssetOf(AssetXmlWriter& writer, const TexturePtr& t, const std::string& url) {
+    if (t) t->writeXml(writer, url);
+}
+
+// Moves a sub-material into `out` when there is one.
+inline void take(MaterialPtr& m, std::vector<MaterialPtr>& out) {
+    if (m) out.push_back(std::move(m));
+}
+
+} // namespace material
+
+// The shared implementation of a material kind. `Derived` provides
+//   static constexpr MaterialKindInfo kInfo;
+//   static std::span<const record::Field<Derived>> fields();
+// declares its fields with their defaults as member initialisers, inherits the
+// constructors (`using MaterialKind::MaterialKind;`), and may hide
+//   bool canBeWritten() const;                 // the members the record requires
+//   bool readVersion(QuickArchive&, unsigned); // irregular older records
+//   bool separate(bool renamed);               // what clone() deep-copies
+// A kind that holds materials overrides takeMaterialMembers() and calls
+// releaseMaterialMembers() from its destructor.
+template <class Derived>
+class MaterialKind : public BaseMaterial {
+public:
+    MaterialKind() = default;
+    explicit MaterialKind(Unnamed tag) : BaseMaterial(tag) {}
+
+    std::int32_t kindId() const override { return Derived::kInfo.kind; }
+    std::string pluginType() const override { return Derived::kInfo.pluginType; }
+
+    void resetToDefaults() override {
+        std::string kept = std::move(name);
+        self() = Derived(Unnamed{}); // the base part takes the (empty) name only
+        if constexpr (Derived::kInfo.resetTakesName)
+            resetBase();
+        else
+            name = std::move(kept);
+    }
+
+    MaterialPtr clone() const override { return copy(false); }
+    MaterialPtr cloneRenamed() const override { return copy(true); }
+
+    bool isEqual(const MaterialPtr& other) const override {
+        if (!other || other->kindId() != kindId()) return false;
+        const auto* that = dynamic_cast<const Derived*>(other.get());
+        if (!that) return false;
+        MaterialWalk walk(MaterialWalk::kCompare, this, that);
+        if (walk.cycle()) return true;
+        if (!walk) return false;
+        return self().equalContent(*that);
+    }
+
+    bool writeToArchive(QuickArchive& ar) override {
+        MaterialWalk walk(MaterialWalk::kWrite, this);
+        if (!walk || !self().canBeWritten()) return false;
+        ar.write(VersionWord::make(0, Derived::kInfo.version));
+        return record::writeFields(ar, self(), Derived::fields(), Derived::kInfo.version);
+    }
+
+    bool readFromArchive(QuickArchive& ar) override {
+        const auto version = ar.get<VersionWord>();
+        if constexpr (Derived::kInfo.resetBeforeRead) resetToDefaults();
+        if (version.first() != 0 || version.second() < 1 || version.second() > Derived::kInfo.version)
+            return material::refuseVersion(ar, Derived::kInfo.what, version);
+        return self().readVersion(ar, version.second());
+    }
+
+    // --- the parts a kind may hide ---
+    bool canBeWritten() const { return true; }
+    bool readVersion(QuickArchive& ar, unsigned version) {
+        return record::readFields(ar, self(), Derived::fields(), version);
+    }
+    bool separate(bool) { return true; }
+    bool equalContent(const Derived& that) const { return record::fieldsEqual(self(), that, Derived::fields()); }
+
+protected:
+    MaterialPtr copy(bool renamed) const {
+        MaterialWalk walk(MaterialWalk::kCopy, this);
+        if (!walk) return {};
+        auto made = boost::make_shared<Derived>(self());
+        if (!made->separate(renamed)) return {};
+        if (renamed) made->name = material::uniqueName(name);
+        return made;
+    }
+
+    Derived& self() { return static_cast<Derived&>(*this); }
+    const Derived& self() const { return static_cast<const Derived&>(*this); }
+};
+
+} // namespace OrvexKavorCore
