@@ -32,6 +32,7 @@ set(DEXMOR_PUBLIC_HEADERS
   materials/ReferenceMaterials.hpp
   materials/SceneMaterials.hpp
   materials/WrapperMaterials.hpp
+  model/Kind.hpp
   model/PerConversion.hpp
   model/WalkGuard.hpp
   options/AllOptions.hpp

@@ -322,6 +322,12 @@ std::string QuickArchive::recordPath() const {
     return path;
 }
 
+bool QuickArchive::checkVersion(VersionWord version, std::uint16_t latest, std::string_view what) {
+    if (version.first() == 0 && version.second() >= 1 && version.second() <= latest) return true;
+    return fail("unknown " + std::string(what) + " version (" + std::to_string(version.first()) + ", " +
+                std::to_string(version.second()) + ")");
+}
+
 bool QuickArchive::fail(std::string_view reason) {
     if (!failure_) failure_ = ReadFailure{std::string(reason), readPos_, recordPath()};
     return false;

@@ -174,6 +174,18 @@ public:
     // For readers that deliberately ignore a member's failure.
     void clearFailure() { failure_.reset(); }
 
+    // --- record versions ---
+    // Every record begins with a version word (0, n). A record reads versions
+    // (0, 1) to (0, latest): checkVersion fails the record with "unknown WHAT
+    // version (a, b)" for any other and returns whether it accepts `version`;
+    // readVersion reads the word and checks it (nullopt once refused).
+    bool checkVersion(VersionWord version, std::uint16_t latest, std::string_view what);
+    std::optional<VersionWord> readVersion(std::uint16_t latest, std::string_view what) {
+        const auto version = get<VersionWord>();
+        if (!checkVersion(version, latest, what)) return std::nullopt;
+        return version;
+    }
+
     // One level of the record path, and the nesting guard. A reader opens a Scope
     // before reading a nested member; when the nesting is too deep the scope is
     // false and the failure is recorded.
