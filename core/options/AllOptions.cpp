@@ -75,178 +75,107 @@ using ChannelsReplacing = Channels<true, false>;
 
 using O = AllOptions;
 
-#define ROW(name, encoding, first) record::fieldAs<enc::encoding, &O::name>(#name, record::since(first))
-#define ROW_IN(name, encoding, first, last) \
-    record::fieldAs<enc::encoding, &O::name>(#name, record::between(first, last))
+using record::between;
+using record::since;
 
 // The options set's record after its VersionWord(1, N), in archive order. A record
 // of version N holds the rows whose versions include N. The comment is the row's
 // number in the record (the version word is row 1).
 constexpr std::array kFields{
-    //     field                         encoding            since       #
-    ROW(   params,                       Record,             0),      // 2
-    ROW(   frameData,                    Record,             0),      // 3
-    ROW(   stampInfo,                    Record,             0),      // 4
-    ROW(   camera,                       Record,             5),      // 5
-    ROW(   bg_tex,                       OptionalTexture,    0),      // 6
-    ROW(   gi_tex,                       OptionalTexture,    0),      // 7
-    ROW(   bg_color,                     Color,              0),      // 8
-    ROW(   gi_color,                     Color,              0),      // 9
-    ROW(   use_gi,                       Int32,              0),      // 10
-    ROW(   use_bg,                       Int32,              0),      // 11
-    ROW(   filter_kind,                  Int32,              0),      // 12
-    ROW(   img_height,                   Int32,              0),      // 13
-    ROW(   img_width,                    Int32,              0),      // 14
-    ROW(   override_fov,                 Int32,              0),      // 15
-    ROW(   override_viewport,            Int32,              0),      // 16
-    ROW(   aux_i2,                       Int32,              0),      // 17 (aux_i2 before aux_i1)
-    ROW(   aux_i1,                       Int32,              0),      // 18
-    ROW(   img_rawFile,                  Int32,              0),      // 19
-    ROW(   save_render,                  Int32,              0),      // 20
-    ROW(   inverse_override_focal_dist,  Int32,              2),      // 21
-    ROW(   aux_i4,                       Int32,              3),      // 22
-    ROW(   physical_on,                  Int32,              5),      // 23
-    ROW(   override_focal_length,        Int32,              6),      // 24
-    ROW(   fov,                          Float32,            0),      // 25
-    ROW(   gi_mult,                      Float32,            0),      // 26
-    ROW(   bg_mult,                      Float32,            0),      // 27
-    ROW(   gi_tex_mult,                  Float32,            0),      // 28
-    ROW(   bg_tex_mult,                  Float32,            0),      // 29
-    ROW(   filter_size,                  Float32,            0),      // 30
-    ROW(   img_pixelAspect,              Float32,            0),      // 31
-    ROW(   aux_f3,                       Float32,            0),      // 32
-    ROW(   zdepth_black,                 Float32,            4),      // 33
-    ROW(   zdepth_white,                 Float32,            4),      // 34
-    ROW(   zdepth_clamp,                 Int32,              4),      // 35
-    ROW_IN(channels,                     ChannelsOfVersion0, 0, 0),   // 36 in version 0
-    ROW_IN(channels,                     ChannelsAdded,      1, 20),  // 36 in versions 1 to 20
-    ROW(   channels,                     ChannelsReplacing,  21),     // 36 from version 21 on
-    ROW(   img_file,                     FileName,           0),      // 37
-    ROW(   kvimg_file,                   FileName,           0),      // 38
-    ROW(   im_file,                      FileName,           0),      // 39
-    ROW(   im_auto_save_file,            FileName,           0),      // 40
-    ROW(   lc_file,                      FileName,           0),      // 41
-    ROW(   lc_auto_save_file,            FileName,           0),      // 42
-    ROW(   pm_file,                      FileName,           0),      // 43
-    ROW(   pm_auto_save_file,            FileName,           0),      // 44
-    ROW(   caustics_file,                FileName,           0),      // 45
-    ROW(   caustics_auto_save_file,      FileName,           0),      // 46
-    ROW(   aux_color,                    Color,              1),      // 47
-    ROW(   aux_i3,                       Int32,              1),      // 48
-    ROW(   gamma_correct_rgb,            Int32,              7),      // 49
-    ROW(   gamma_correct_ldr_textures,   Int32,              7),      // 50
-    ROW(   do_animation,                 Int32,              8),      // 51
-    ROW(   frame_rate,                   Int32,              8),      // 52
-    ROW(   frames_per_second,            Float32,            8),      // 53
-    ROW(   reflect_color,                Color,              9),      // 54
-    ROW(   refract_color,                Color,              9),      // 55
-    ROW(   reflect_mult,                 Float32,            9),      // 56
-    ROW(   refract_mult,                 Float32,            9),      // 57
-    ROW(   reflect_tex_mult,             Float32,            9),      // 58
-    ROW(   refract_tex_mult,             Float32,            9),      // 59
-    ROW(   use_reflect,                  Int32,              9),      // 60
-    ROW(   use_refract,                  Int32,              9),      // 61
-    ROW(   reflect_tex,                  OptionalTexture,    9),      // 62
-    ROW(   refract_tex,                  OptionalTexture,    9),      // 63
-    ROW(   aux_i5,                       Int32,              16),     // 64
-    ROW(   aux_f1,                       Float32,            17),     // 65
-    ROW(   aux_f2,                       Float32,            17),     // 66
-    ROW(   input_gamma,                  Float32,            18),     // 67
-    ROW(   aux_i8,                       Int32,              19),     // 68
-    ROW(   aux_i6,                       Int32,              20),     // 69
-    ROW(   aux_i7,                       Int32,              20),     // 70
-    ROW(   aux_text,                     WString,            20),     // 71
-    ROW(   aux_i9,                       Int32,              22),     // 72
-    ROW(   specify_film_width,           Int32,              23),     // 73
+    record::fieldAs<enc::Record, &O::params>("params", since(0)),      // 2
+    record::fieldAs<enc::Record, &O::frameData>("frameData", since(0)),      // 3
+    record::fieldAs<enc::Record, &O::stampInfo>("stampInfo", since(0)),      // 4
+    record::fieldAs<enc::Record, &O::camera>("camera", since(5)),      // 5
+    record::fieldAs<enc::OptionalTexture, &O::bg_tex>("bg_tex", since(0)),      // 6
+    record::fieldAs<enc::OptionalTexture, &O::gi_tex>("gi_tex", since(0)),      // 7
+    record::fieldAs<enc::Color, &O::bg_color>("bg_color", since(0)),      // 8
+    record::fieldAs<enc::Color, &O::gi_color>("gi_color", since(0)),      // 9
+    record::fieldAs<enc::Int32, &O::use_gi>("use_gi", since(0)),      // 10
+    record::fieldAs<enc::Int32, &O::use_bg>("use_bg", since(0)),      // 11
+    record::fieldAs<enc::Int32, &O::filter_kind>("filter_kind", since(0)),      // 12
+    record::fieldAs<enc::Int32, &O::img_height>("img_height", since(0)),      // 13
+    record::fieldAs<enc::Int32, &O::img_width>("img_width", since(0)),      // 14
+    record::fieldAs<enc::Int32, &O::override_fov>("override_fov", since(0)),      // 15
+    record::fieldAs<enc::Int32, &O::override_viewport>("override_viewport", since(0)),      // 16
+    record::fieldAs<enc::Int32, &O::aux_i2>("aux_i2", since(0)),      // 17 (aux_i2 before aux_i1)
+    record::fieldAs<enc::Int32, &O::aux_i1>("aux_i1", since(0)),      // 18
+    record::fieldAs<enc::Int32, &O::img_rawFile>("img_rawFile", since(0)),      // 19
+    record::fieldAs<enc::Int32, &O::save_render>("save_render", since(0)),      // 20
+    record::fieldAs<enc::Int32, &O::inverse_override_focal_dist>("inverse_override_focal_dist", since(2)),      // 21
+    record::fieldAs<enc::Int32, &O::aux_i4>("aux_i4", since(3)),      // 22
+    record::fieldAs<enc::Int32, &O::physical_on>("physical_on", since(5)),      // 23
+    record::fieldAs<enc::Int32, &O::override_focal_length>("override_focal_length", since(6)),      // 24
+    record::fieldAs<enc::Float32, &O::fov>("fov", since(0)),      // 25
+    record::fieldAs<enc::Float32, &O::gi_mult>("gi_mult", since(0)),      // 26
+    record::fieldAs<enc::Float32, &O::bg_mult>("bg_mult", since(0)),      // 27
+    record::fieldAs<enc::Float32, &O::gi_tex_mult>("gi_tex_mult", since(0)),      // 28
+    record::fieldAs<enc::Float32, &O::bg_tex_mult>("bg_tex_mult", since(0)),      // 29
+    record::fieldAs<enc::Float32, &O::filter_size>("filter_size", since(0)),      // 30
+    record::fieldAs<enc::Float32, &O::img_pixelAspect>("img_pixelAspect", since(0)),      // 31
+    record::fieldAs<enc::Float32, &O::aux_f3>("aux_f3", since(0)),      // 32
+    record::fieldAs<enc::Float32, &O::zdepth_black>("zdepth_black", since(4)),      // 33
+    record::fieldAs<enc::Float32, &O::zdepth_white>("zdepth_white", since(4)),      // 34
+    record::fieldAs<enc::Int32, &O::zdepth_clamp>("zdepth_clamp", since(4)),      // 35
+    record::fieldAs<enc::ChannelsOfVersion0, &O::channels>("channels", between(0, 0)),   // 36 in version 0
+    record::fieldAs<enc::ChannelsAdded, &O::channels>("channels", between(1, 20)),  // 36 in versions 1 to 20
+    record::fieldAs<enc::ChannelsReplacing, &O::channels>("channels", since(21)),     // 36 from version 21 on
+    record::fieldAs<enc::FileName, &O::img_file>("img_file", since(0)),      // 37
+    record::fieldAs<enc::FileName, &O::kvimg_file>("kvimg_file", since(0)),      // 38
+    record::fieldAs<enc::FileName, &O::im_file>("im_file", since(0)),      // 39
+    record::fieldAs<enc::FileName, &O::im_auto_save_file>("im_auto_save_file", since(0)),      // 40
+    record::fieldAs<enc::FileName, &O::lc_file>("lc_file", since(0)),      // 41
+    record::fieldAs<enc::FileName, &O::lc_auto_save_file>("lc_auto_save_file", since(0)),      // 42
+    record::fieldAs<enc::FileName, &O::pm_file>("pm_file", since(0)),      // 43
+    record::fieldAs<enc::FileName, &O::pm_auto_save_file>("pm_auto_save_file", since(0)),      // 44
+    record::fieldAs<enc::FileName, &O::caustics_file>("caustics_file", since(0)),      // 45
+    record::fieldAs<enc::FileName, &O::caustics_auto_save_file>("caustics_auto_save_file", since(0)),      // 46
+    record::fieldAs<enc::Color, &O::aux_color>("aux_color", since(1)),      // 47
+    record::fieldAs<enc::Int32, &O::aux_i3>("aux_i3", since(1)),      // 48
+    record::fieldAs<enc::Int32, &O::gamma_correct_rgb>("gamma_correct_rgb", since(7)),      // 49
+    record::fieldAs<enc::Int32, &O::gamma_correct_ldr_textures>("gamma_correct_ldr_textures", since(7)),      // 50
+    record::fieldAs<enc::Int32, &O::do_animation>("do_animation", since(8)),      // 51
+    record::fieldAs<enc::Int32, &O::frame_rate>("frame_rate", since(8)),      // 52
+    record::fieldAs<enc::Float32, &O::frames_per_second>("frames_per_second", since(8)),      // 53
+    record::fieldAs<enc::Color, &O::reflect_color>("reflect_color", since(9)),      // 54
+    record::fieldAs<enc::Color, &O::refract_color>("refract_color", since(9)),      // 55
+    record::fieldAs<enc::Float32, &O::reflect_mult>("reflect_mult", since(9)),      // 56
+    record::fieldAs<enc::Float32, &O::refract_mult>("refract_mult", since(9)),      // 57
+    record::fieldAs<enc::Float32, &O::reflect_tex_mult>("reflect_tex_mult", since(9)),      // 58
+    record::fieldAs<enc::Float32, &O::refract_tex_mult>("refract_tex_mult", since(9)),      // 59
+    record::fieldAs<enc::Int32, &O::use_reflect>("use_reflect", since(9)),      // 60
+    record::fieldAs<enc::Int32, &O::use_refract>("use_refract", since(9)),      // 61
+    record::fieldAs<enc::OptionalTexture, &O::reflect_tex>("reflect_tex", since(9)),      // 62
+    record::fieldAs<enc::OptionalTexture, &O::refract_tex>("refract_tex", since(9)),      // 63
+    record::fieldAs<enc::Int32, &O::aux_i5>("aux_i5", since(16)),     // 64
+    record::fieldAs<enc::Float32, &O::aux_f1>("aux_f1", since(17)),     // 65
+    record::fieldAs<enc::Float32, &O::aux_f2>("aux_f2", since(17)),     // 66
+    record::fieldAs<enc::Float32, &O::input_gamma>("input_gamma", since(18)),     // 67
+    record::fieldAs<enc::Int32, &O::aux_i8>("aux_i8", since(19)),     // 68
+    record::fieldAs<enc::Int32, &O::aux_i6>("aux_i6", since(20)),     // 69
+    record::fieldAs<enc::Int32, &O::aux_i7>("aux_i7", since(20)),     // 70
+    record::fieldAs<enc::WString, &O::aux_text>("aux_text", since(20)),     // 71
+    record::fieldAs<enc::Int32, &O::aux_i9>("aux_i9", since(22)),     // 72
+    record::fieldAs<enc::Int32, &O::specify_film_width>("specify_film_width", since(23)),     // 73
 };
 
-#undef ROW
-#undef ROW_IN
 
 static_assert(record::enc::countHeld(kFields, 23) == 72, "a version-23 record holds rows 2 to 73");
 static_assert(record::enc::countHeld(kFields, 0) == 37, "a version-0 record holds 37 rows after its version word");
 
 std::string versionText(VersionWord version) {
-    return "(" + std::to_string(version.first()) + ", " + std::to_string(version.second()) + ")";
+    std::string text = "(";
+    text += std::to_string(version.first());
+    text += ", ";
+    text += std::to_string(version.second());
+    text += ')';
+    return text;
 }
 
 } // namespace
 
-AllOptions::AllOptions() { resetToDefaults(); }
+AllOptions::AllOptions() { params.applyOptionsSetOverrides(); }
 
-void AllOptions::resetToDefaults() {
-    params.resetToDefaults();
-    params.applyOptionsSetOverrides();
-    frameData.resetToDefaults();
-    stampInfo.resetToDefaults();
-    channels.clear();
-
-    bg_color = Color{0.0f, 0.0f, 0.0f};
-    gi_color = Color{0.8f, 0.8980392f, 1.0f};
-    reflect_color = Color{0.0f, 0.0f, 0.0f};
-    refract_color = Color{0.0f, 0.0f, 0.0f};
-    aux_color = Color{0.5f, 0.5f, 0.5f};
-    bg_tex.reset();
-    gi_tex.reset();
-    reflect_tex.reset();
-    refract_tex.reset();
-    use_gi = 0;
-    use_bg = 0;
-    use_reflect = 0;
-    use_refract = 0;
-    filter_kind = 5;
-    img_height = 600;
-    img_width = 800;
-    override_fov = 0;
-    override_viewport = 0;
-    aux_i1 = 0;
-    aux_i2 = 0;
-    img_rawFile = 0;
-    save_render = 0;
-    aux_i3 = 1;
-    inverse_override_focal_dist = 1;
-    aux_i4 = 1;
-    aux_i5 = 0;
-    aux_i6 = 1;
-    aux_i7 = 0;
-    aux_text.clear();
-    // Reset as well (not only at construction), so that reading an older record
-    // into a used options set does not keep values of the earlier content.
-    aux_f1 = 0.0f;
-    aux_f2 = 0.0f;
-    fov = 45.0f;
-    gi_mult = 1.0f;
-    bg_mult = 1.0f;
-    reflect_mult = 1.0f;
-    refract_mult = 1.0f;
-    gi_tex_mult = 1.0f;
-    bg_tex_mult = 1.0f;
-    reflect_tex_mult = 1.0f;
-    refract_tex_mult = 1.0f;
-    filter_size = 1.5f;
-    aux_f3 = 1.333f;
-    img_pixelAspect = 1.0f;
-    zdepth_black = 0.0f;
-    zdepth_white = 1000.0f;
-    zdepth_clamp = 1;
-    camera.resetToDefaults();
-    physical_on = 0;
-    override_focal_length = 0;
-    gamma_correct_rgb = 0;
-    gamma_correct_ldr_textures = 0;
-    input_gamma = 2.2f;
-    aux_i8 = 1;
-    do_animation = 0;
-    frame_rate = 0;
-    frames_per_second = 30.0f;
-    aux_i9 = 0;
-    specify_film_width = 0;
-    for (std::string* name : {&img_file, &kvimg_file, &im_file, &im_auto_save_file, &lc_file, &lc_auto_save_file,
-                              &pm_file, &pm_auto_save_file, &caustics_file, &caustics_auto_save_file})
-        name->clear();
-
-    channels = {126, 125}; // "RGB color", "Alpha"
-}
+void AllOptions::resetToDefaults() { *this = AllOptions(); }
 
 bool AllOptions::writeToArchive(QuickArchive& ar) {
     ar.write(VersionWord::make(kVersionFirstHalf, kVersion));

@@ -12,60 +12,59 @@ namespace {
 
 using F = KavorUtils::KavorFrameData;
 
-#define ROW(name, encoding) record::fieldAs<record::enc::encoding, &F::name>(#name)
+namespace enc = record::enc;
 
 // The frame data's record, in archive order after its VersionWord(0, 1).
 constexpr std::array kFields{
-    ROW(t, Float64),                     // 1
-    ROW(frameStart, Float64),            // 2
-    ROW(frameEnd, Float64),              // 3
-    ROW(currentFrame, Int32),            // 4
-    ROW(worldToCam, Transform),          // 5
-    ROW(camToWorld, Transform),          // 6
-    ROW(fov, Float32),                   // 7
-    ROW(nearRange, Float32),             // 8
-    ROW(farRange, Float32),              // 9
-    ROW(focal_dist, Float32),            // 10
-    ROW(aperture, Float32),              // 11
-    ROW(rotation, Float32),              // 12
-    ROW(clippingPlanes, Int32),          // 13
-    ROW(clipNear, Float32),              // 14
-    ROW(clipFar, Float32),               // 15
-    ROW(projType, Int32),                // 16
-    ROW(zoomFractor, Float32),           // 17
-    ROW(infiniteProj, Int32),            // 18
-    ROW(height, Float32),                // 19
-    ROW(auto_fit, Int32),                // 20
-    ROW(dist, Float32),                  // 21
-    ROW(curve, Float32),                 // 22
-    ROW(orthoAdjustToScene, Int32),      // 23
-    ROW(ambient, Color),                 // 24
-    ROW(background, Color),              // 25
-    ROW(globalLightLevel, Color),        // 26
-    ROW(kavorGIBackground, Color),       // 27
-    ROW(kavorRRBackground, Color),       // 28
-    ROW(kavorRefractBackground, Color),  // 29
-    ROW(rgn_left, Float32),              // 30
-    ROW(rgn_width, Float32),             // 31
-    ROW(rgn_top, Float32),               // 32
-    ROW(rgn_height, Float32),            // 33
-    ROW(fd_aux1, Int32),                 // 34
-    ROW(fd_aux2, Int32),                 // 35
-    ROW(bmp_width, Int32),               // 36
-    ROW(bmp_height, Int32),              // 37
-    ROW(r_left, Int32),                  // 38
-    ROW(r_width, Int32),                 // 39
-    ROW(r_top, Int32),                   // 40
-    ROW(r_height, Int32),                // 41
-    ROW(devAspect, Float32),             // 42
-    ROW(fieldMask, Int32),               // 43
-    ROW(fieldOrder, Int32),              // 44
-    ROW(firstField, Int32),              // 45
-    ROW(dark_mult, Float32),             // 46
-    ROW(bright_mult, Float32),           // 47
+    record::fieldAs<enc::Float64, &F::t>("t"),                     // 1
+    record::fieldAs<enc::Float64, &F::frameStart>("frameStart"),            // 2
+    record::fieldAs<enc::Float64, &F::frameEnd>("frameEnd"),              // 3
+    record::fieldAs<enc::Int32, &F::currentFrame>("currentFrame"),            // 4
+    record::fieldAs<enc::Transform, &F::worldToCam>("worldToCam"),          // 5
+    record::fieldAs<enc::Transform, &F::camToWorld>("camToWorld"),          // 6
+    record::fieldAs<enc::Float32, &F::fov>("fov"),                   // 7
+    record::fieldAs<enc::Float32, &F::nearRange>("nearRange"),             // 8
+    record::fieldAs<enc::Float32, &F::farRange>("farRange"),              // 9
+    record::fieldAs<enc::Float32, &F::focal_dist>("focal_dist"),            // 10
+    record::fieldAs<enc::Float32, &F::aperture>("aperture"),              // 11
+    record::fieldAs<enc::Float32, &F::rotation>("rotation"),              // 12
+    record::fieldAs<enc::Int32, &F::clippingPlanes>("clippingPlanes"),          // 13
+    record::fieldAs<enc::Float32, &F::clipNear>("clipNear"),              // 14
+    record::fieldAs<enc::Float32, &F::clipFar>("clipFar"),               // 15
+    record::fieldAs<enc::Int32, &F::projType>("projType"),                // 16
+    record::fieldAs<enc::Float32, &F::zoomFractor>("zoomFractor"),           // 17
+    record::fieldAs<enc::Int32, &F::infiniteProj>("infiniteProj"),            // 18
+    record::fieldAs<enc::Float32, &F::height>("height"),                // 19
+    record::fieldAs<enc::Int32, &F::auto_fit>("auto_fit"),                // 20
+    record::fieldAs<enc::Float32, &F::dist>("dist"),                  // 21
+    record::fieldAs<enc::Float32, &F::curve>("curve"),                 // 22
+    record::fieldAs<enc::Int32, &F::orthoAdjustToScene>("orthoAdjustToScene"),      // 23
+    record::fieldAs<enc::Color, &F::ambient>("ambient"),                 // 24
+    record::fieldAs<enc::Color, &F::background>("background"),              // 25
+    record::fieldAs<enc::Color, &F::globalLightLevel>("globalLightLevel"),        // 26
+    record::fieldAs<enc::Color, &F::kavorGIBackground>("kavorGIBackground"),       // 27
+    record::fieldAs<enc::Color, &F::kavorRRBackground>("kavorRRBackground"),       // 28
+    record::fieldAs<enc::Color, &F::kavorRefractBackground>("kavorRefractBackground"),  // 29
+    record::fieldAs<enc::Float32, &F::rgn_left>("rgn_left"),              // 30
+    record::fieldAs<enc::Float32, &F::rgn_width>("rgn_width"),             // 31
+    record::fieldAs<enc::Float32, &F::rgn_top>("rgn_top"),               // 32
+    record::fieldAs<enc::Float32, &F::rgn_height>("rgn_height"),            // 33
+    record::fieldAs<enc::Int32, &F::fd_aux1>("fd_aux1"),                 // 34
+    record::fieldAs<enc::Int32, &F::fd_aux2>("fd_aux2"),                 // 35
+    record::fieldAs<enc::Int32, &F::bmp_width>("bmp_width"),               // 36
+    record::fieldAs<enc::Int32, &F::bmp_height>("bmp_height"),              // 37
+    record::fieldAs<enc::Int32, &F::r_left>("r_left"),                  // 38
+    record::fieldAs<enc::Int32, &F::r_width>("r_width"),                 // 39
+    record::fieldAs<enc::Int32, &F::r_top>("r_top"),                   // 40
+    record::fieldAs<enc::Int32, &F::r_height>("r_height"),                // 41
+    record::fieldAs<enc::Float32, &F::devAspect>("devAspect"),             // 42
+    record::fieldAs<enc::Int32, &F::fieldMask>("fieldMask"),               // 43
+    record::fieldAs<enc::Int32, &F::fieldOrder>("fieldOrder"),              // 44
+    record::fieldAs<enc::Int32, &F::firstField>("firstField"),              // 45
+    record::fieldAs<enc::Float32, &F::dark_mult>("dark_mult"),             // 46
+    record::fieldAs<enc::Float32, &F::bright_mult>("bright_mult"),           // 47
 };
 
-#undef ROW
 
 static_assert(kFields.size() == 47);
 
@@ -78,10 +77,8 @@ bool OrvexFrameData::writeToArchive(QuickArchive& ar) {
 
 bool OrvexFrameData::readFromArchive(QuickArchive& ar) {
     resetToDefaults();
-    const auto version = ar.get<VersionWord>();
-    if (!version.is(0, kVersion))
-        return ar.fail("unknown frame data version (" + std::to_string(version.first()) + ", " +
-                       std::to_string(version.second()) + ")");
+    static_assert(kVersion == 1, "frame data records have one version");
+    if (!ar.readVersion(kVersion, "frame data")) return false;
     return record::readFields(ar, static_cast<F&>(*this), kFields, kVersion);
 }
 

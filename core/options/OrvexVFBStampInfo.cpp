@@ -17,9 +17,7 @@ bool OrvexVFBStampInfo::writeToArchive(QuickArchive& ar) {
 bool OrvexVFBStampInfo::readFromArchive(QuickArchive& ar) {
     resetToDefaults();
     const auto version = ar.get<VersionWord>();
-    if (version.first() != 0 || version.second() < 1 || version.second() > kVersion)
-        return ar.fail("unknown stamp info version (" + std::to_string(version.first()) + ", " +
-                       std::to_string(version.second()) + ")");
+    if (!ar.checkVersion(version, kVersion, "stamp info")) return false;
     ar.read(si_i1);
     ar.read(si_i2);
     ar.read(si_i3);

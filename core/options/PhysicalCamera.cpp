@@ -17,45 +17,42 @@ using record::always;
 using record::between;
 using record::since;
 
-#define ROW(name, encoding, versions) record::fieldAs<record::enc::encoding, &C::name>(#name, versions)
 
 // The camera's record after its VersionWord(0, V), in archive order. A record of
 // version V holds the rows whose versions include V.
 constexpr std::array kFields{
-    //  field                  encoding          versions
-    ROW(type,                  Int32,            always()),
-    ROW(film_width,            Float32,          always()),
-    ROW(focal_length,          AnimatedAsPlain,  between(1, 1)),
-    ROW(focal_length,          Animated,         since(2)),
-    ROW(zoom_factor,           Float32,          always()),
-    ROW(distortion,            Float32,          always()),
-    ROW(f_number,              Float32,          always()),
-    ROW(lens_shift,            Float32,          always()),
-    ROW(shutter_speed,         Float32,          always()),
-    ROW(shutter_angle,         Float32,          always()),
-    ROW(shutter_offset,        Float32,          always()),
-    ROW(latency,               Float32,          always()),
-    ROW(ISO,                   Float32,          always()),
-    ROW(specify_focus,         Int32,            always()),
-    ROW(focus_distance,        AnimatedAsPlain,  between(1, 1)),
-    ROW(focus_distance,        Animated,         since(2)),
-    ROW(targeted,              Int32,            always()),
-    ROW(target_distance,       Float32,          always()),
-    ROW(dof_display_threshold, Float32,          always()),
-    ROW(exposure,              Int32,            always()),
-    ROW(white_balance,         Color,            always()),
-    ROW(vignetting,            Int32,            always()),
-    ROW(blades_enable,         Int32,            always()),
-    ROW(blades_num,            Int32,            always()),
-    ROW(blades_rotation,       Float32,          always()),
-    ROW(center_bias,           Float32,          always()),
-    ROW(anisotropy,            Float32,          always()),
-    ROW(use_dof,               Int32,            always()),
-    ROW(use_moblur,            Int32,            always()),
-    ROW(subdivs,               Int32,            always()),
+    record::fieldAs<record::enc::Int32, &C::type>("type", always()),
+    record::fieldAs<record::enc::Float32, &C::film_width>("film_width", always()),
+    record::fieldAs<record::enc::AnimatedAsPlain, &C::focal_length>("focal_length", between(1, 1)),
+    record::fieldAs<record::enc::Animated, &C::focal_length>("focal_length", since(2)),
+    record::fieldAs<record::enc::Float32, &C::zoom_factor>("zoom_factor", always()),
+    record::fieldAs<record::enc::Float32, &C::distortion>("distortion", always()),
+    record::fieldAs<record::enc::Float32, &C::f_number>("f_number", always()),
+    record::fieldAs<record::enc::Float32, &C::lens_shift>("lens_shift", always()),
+    record::fieldAs<record::enc::Float32, &C::shutter_speed>("shutter_speed", always()),
+    record::fieldAs<record::enc::Float32, &C::shutter_angle>("shutter_angle", always()),
+    record::fieldAs<record::enc::Float32, &C::shutter_offset>("shutter_offset", always()),
+    record::fieldAs<record::enc::Float32, &C::latency>("latency", always()),
+    record::fieldAs<record::enc::Float32, &C::ISO>("ISO", always()),
+    record::fieldAs<record::enc::Int32, &C::specify_focus>("specify_focus", always()),
+    record::fieldAs<record::enc::AnimatedAsPlain, &C::focus_distance>("focus_distance", between(1, 1)),
+    record::fieldAs<record::enc::Animated, &C::focus_distance>("focus_distance", since(2)),
+    record::fieldAs<record::enc::Int32, &C::targeted>("targeted", always()),
+    record::fieldAs<record::enc::Float32, &C::target_distance>("target_distance", always()),
+    record::fieldAs<record::enc::Float32, &C::dof_display_threshold>("dof_display_threshold", always()),
+    record::fieldAs<record::enc::Int32, &C::exposure>("exposure", always()),
+    record::fieldAs<record::enc::Color, &C::white_balance>("white_balance", always()),
+    record::fieldAs<record::enc::Int32, &C::vignetting>("vignetting", always()),
+    record::fieldAs<record::enc::Int32, &C::blades_enable>("blades_enable", always()),
+    record::fieldAs<record::enc::Int32, &C::blades_num>("blades_num", always()),
+    record::fieldAs<record::enc::Float32, &C::blades_rotation>("blades_rotation", always()),
+    record::fieldAs<record::enc::Float32, &C::center_bias>("center_bias", always()),
+    record::fieldAs<record::enc::Float32, &C::anisotropy>("anisotropy", always()),
+    record::fieldAs<record::enc::Int32, &C::use_dof>("use_dof", always()),
+    record::fieldAs<record::enc::Int32, &C::use_moblur>("use_moblur", always()),
+    record::fieldAs<record::enc::Int32, &C::subdivs>("subdivs", always()),
 };
 
-#undef ROW
 
 static_assert(record::enc::countHeld(kFields, 1) == 28 && record::enc::countHeld(kFields, 2) == 28,
               "both versions store the 28 fields");
@@ -75,9 +72,7 @@ bool PhysicalCamera::writeToArchive(QuickArchive& ar) {
 bool PhysicalCamera::readFromArchive(QuickArchive& ar) {
     resetToDefaults();
     const auto version = ar.get<VersionWord>();
-    if (version.first() != 0 || version.second() < 1 || version.second() > kVersion)
-        return ar.fail("unknown physical camera version (" + std::to_string(version.first()) + ", " +
-                       std::to_string(version.second()) + ")");
+    if (!ar.checkVersion(version, kVersion, "physical camera")) return false;
     return record::readFields(ar, *this, kFields, version.second());
 }
 

@@ -58,29 +58,26 @@ using record::always;
 using record::between;
 using record::since;
 
-#define ROW(name, encoding, versions) record::fieldAs<enc::encoding, &V::name>(#name, versions)
 
 // The render view's record after its VersionWord(0, V), in archive order. A record
 // of version V holds the rows whose versions include V.
 constexpr std::array kFields{
-    //  field        encoding          versions
-    ROW(transform,   AnimatedAsPlain,  between(1, 1)),
-    ROW(box1,        Box,              always()),
-    ROW(box2,        Box,              always()),
-    ROW(anim_r1,     AnimatedAsPlain,  between(1, 2)),
-    ROW(anim_r2,     AnimatedAsPlain,  between(1, 2)),
-    ROW(anim_r3,     AnimatedAsPlain,  between(1, 2)),
-    ROW(img_width,   Int32,            always()),
-    ROW(img_height,  Int32,            always()),
-    ROW(anim_i1,     InvertedFlag,     between(1, 2)),
-    ROW(anim_r1,     Animated,         since(3)),
-    ROW(anim_r2,     Animated,         since(3)),
-    ROW(anim_r3,     Animated,         since(3)),
-    ROW(anim_i1,     Animated,         since(3)),
-    ROW(transform,   Animated,         since(2)),
+    record::fieldAs<enc::AnimatedAsPlain, &V::transform>("transform", between(1, 1)),
+    record::fieldAs<enc::Box, &V::box1>("box1", always()),
+    record::fieldAs<enc::Box, &V::box2>("box2", always()),
+    record::fieldAs<enc::AnimatedAsPlain, &V::anim_r1>("anim_r1", between(1, 2)),
+    record::fieldAs<enc::AnimatedAsPlain, &V::anim_r2>("anim_r2", between(1, 2)),
+    record::fieldAs<enc::AnimatedAsPlain, &V::anim_r3>("anim_r3", between(1, 2)),
+    record::fieldAs<enc::Int32, &V::img_width>("img_width", always()),
+    record::fieldAs<enc::Int32, &V::img_height>("img_height", always()),
+    record::fieldAs<enc::InvertedFlag, &V::anim_i1>("anim_i1", between(1, 2)),
+    record::fieldAs<enc::Animated, &V::anim_r1>("anim_r1", since(3)),
+    record::fieldAs<enc::Animated, &V::anim_r2>("anim_r2", since(3)),
+    record::fieldAs<enc::Animated, &V::anim_r3>("anim_r3", since(3)),
+    record::fieldAs<enc::Animated, &V::anim_i1>("anim_i1", since(3)),
+    record::fieldAs<enc::Animated, &V::transform>("transform", since(2)),
 };
 
-#undef ROW
 
 } // namespace
 
@@ -98,9 +95,7 @@ bool RenderView::writeToArchive(QuickArchive& ar) {
 bool RenderView::readFromArchive(QuickArchive& ar) {
     const auto version = ar.get<VersionWord>();
     resetToDefaults();
-    if (version.first() != 0 || version.second() < 1 || version.second() > kVersion)
-        return ar.fail("unknown render view version (" + std::to_string(version.first()) + ", " +
-                       std::to_string(version.second()) + ")");
+    if (!ar.checkVersion(version, kVersion, "render view")) return false;
     return record::readFields(ar, *this, kFields, version.second());
 }
 

@@ -42,16 +42,17 @@ public:
     static constexpr std::uint32_t kFirstStoredChannel = 100;
     static constexpr std::uint32_t kLastStoredChannel = 132;
 
-    // The fields in declaration order. Each receives its default from
-    // resetToDefaults (which the constructor calls); the defaults are listed there.
+    // The fields in declaration order, with their defaults. The renderer
+    // parameter block starts from its own defaults with the options set's
+    // overrides (applied by the constructor).
     OrvexParams params;
     OrvexFrameData frameData;
     OrvexVFBStampInfo stampInfo;
-    Color bg_color;
-    Color gi_color;
-    Color reflect_color;
-    Color refract_color;
-    Color aux_color;
+    Color bg_color{0.0f, 0.0f, 0.0f};
+    Color gi_color{0.8f, 0.8980392f, 1.0f};
+    Color reflect_color{0.0f, 0.0f, 0.0f};
+    Color refract_color{0.0f, 0.0f, 0.0f};
+    Color aux_color{0.5f, 0.5f, 0.5f};
     // Environment textures; any of them may be empty. Copies of an options set
     // share them.
     TexturePtr bg_tex;
@@ -59,54 +60,54 @@ public:
     TexturePtr reflect_tex;
     TexturePtr refract_tex;
     // Render channel ids (see options/RenderChannels.hpp), in frame-buffer order.
-    std::vector<std::uint32_t> channels;
+    std::vector<std::uint32_t> channels{126, 125}; // "RGB color", "Alpha"
     std::int32_t use_gi = 0;
     std::int32_t use_bg = 0;
     std::int32_t use_reflect = 0;
     std::int32_t use_refract = 0;
-    std::int32_t filter_kind = 0;
-    std::int32_t img_height = 0;
-    std::int32_t img_width = 0;
+    std::int32_t filter_kind = 5;
+    std::int32_t img_height = 600;
+    std::int32_t img_width = 800;
     std::int32_t override_fov = 0;
     std::int32_t override_viewport = 0;
     std::int32_t aux_i1 = 0;
     std::int32_t aux_i2 = 0;
     std::int32_t img_rawFile = 0;
     std::int32_t save_render = 0;
-    std::int32_t aux_i3 = 0;
-    std::int32_t inverse_override_focal_dist = 0;
-    std::int32_t aux_i4 = 0;
+    std::int32_t aux_i3 = 1;
+    std::int32_t inverse_override_focal_dist = 1;
+    std::int32_t aux_i4 = 1;
     std::int32_t aux_i5 = 0;
-    std::int32_t aux_i6 = 0;
+    std::int32_t aux_i6 = 1;
     std::int32_t aux_i7 = 0;
     std::string aux_text; // UTF-8
     float aux_f1 = 0.0f;
     float aux_f2 = 0.0f;
-    float fov = 0.0f;
-    float gi_mult = 0.0f;
-    float bg_mult = 0.0f;
-    float reflect_mult = 0.0f;
-    float refract_mult = 0.0f;
-    float gi_tex_mult = 0.0f;
-    float bg_tex_mult = 0.0f;
-    float reflect_tex_mult = 0.0f;
-    float refract_tex_mult = 0.0f;
-    float filter_size = 0.0f;
-    float aux_f3 = 0.0f;
-    float img_pixelAspect = 0.0f;
+    float fov = 45.0f;
+    float gi_mult = 1.0f;
+    float bg_mult = 1.0f;
+    float reflect_mult = 1.0f;
+    float refract_mult = 1.0f;
+    float gi_tex_mult = 1.0f;
+    float bg_tex_mult = 1.0f;
+    float reflect_tex_mult = 1.0f;
+    float refract_tex_mult = 1.0f;
+    float filter_size = 1.5f;
+    float aux_f3 = 1.333f;
+    float img_pixelAspect = 1.0f;
     float zdepth_black = 0.0f;
-    float zdepth_white = 0.0f;
-    std::int32_t zdepth_clamp = 0;
+    float zdepth_white = 1000.0f;
+    std::int32_t zdepth_clamp = 1;
     PhysicalCamera camera;
     std::int32_t physical_on = 0;
     std::int32_t override_focal_length = 0;
     std::int32_t gamma_correct_rgb = 0;
     std::int32_t gamma_correct_ldr_textures = 0;
-    float input_gamma = 0.0f;
-    std::int32_t aux_i8 = 0;
+    float input_gamma = 2.2f;
+    std::int32_t aux_i8 = 1;
     std::int32_t do_animation = 0;
     std::int32_t frame_rate = 0;
-    float frames_per_second = 0.0f;
+    float frames_per_second = 30.0f;
     std::int32_t aux_i9 = 0;
     std::int32_t specify_film_width = 0;
     // File names, UTF-8, at most kFileNameUnits UTF-16 code units each (a longer
