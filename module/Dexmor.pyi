@@ -17,6 +17,8 @@ from typing import Optional, Union
 
 _Path = Union[str, "os.PathLike[str]"]
 
+__version__: str
+
 class error(Exception):
     """Raised when a path's extension is not the one the call expects (".zelmat"
     or ".zelopt", in any letter case), or when a conversion fails for a reason

@@ -13,6 +13,7 @@
 
 #include "PythonText.hpp"
 #include <dexmor/dexmor.hpp>
+#include <dexmor/version.hpp>
 #include <dexmor/platform/Text.hpp>
 
 #include <cstring>
@@ -236,6 +237,10 @@ PyModuleDef moduleDefinition = {
 PyMODINIT_FUNC PyInit_Dexmor() {
     PyObject* module = PyModule_Create(&moduleDefinition);
     if (!module) return nullptr;
+    if (PyModule_AddStringConstant(module, "__version__", DEXMOR_VERSION_STRING) < 0) {
+        Py_DECREF(module);
+        return nullptr;
+    }
 
     PyObject* error = PyErr_NewException("Dexmor.error", nullptr, nullptr);
     if (!error) {

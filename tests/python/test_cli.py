@@ -119,10 +119,14 @@ def test_help(args):
         assert word in run.stdout.decode()
 
 
-def test_version():
+def test_tool_and_module_give_the_project_version():
     project = re.search(r"project\(Dexmor VERSION ([0-9.]+)", (SOURCE_DIR / "CMakeLists.txt").read_text())
+    version = project.group(1)
     run = dexmor("--version")
-    assert (run.returncode, run.stdout.decode()) == (0, f"dexmor {project.group(1)}\n")
+    assert (run.returncode, run.stdout.decode()) == (0, f"dexmor {version}\n")
+    import Dexmor
+
+    assert Dexmor.__version__ == version
 
 
 def test_parallel_jobs_write_the_same_documents(tmp_path):
