@@ -230,6 +230,19 @@ int main(int argc, char** argv) {
         keepLibrary("lib_uvw_kind" + std::to_string(kind), {diffuseWith(texture)});
     }
 
+    {
+        // Two skies whose stored default suns differ only in the sign of a zero
+        // shadow bias: read once or twice, the library must give one document.
+        const ConversionContext context;
+        QuickArchive ar;
+        writeMember(ar, diffuseWith(boost::make_shared<SkyTexture>()));
+        sharedDefaultSun()->shadowBias = -0.0f;
+        writeMember(ar, diffuseWith(boost::make_shared<SkyTexture>()));
+        const std::uint32_t header[2] = {VersionWord::make(0, 2).raw, 2};
+        keep("lib_sky_default_sun_minus_zero",
+             std::string(reinterpret_cast<const char*>(header), sizeof header) + archiveBytes(ar));
+    }
+
     const std::string sampleOptions = readFile(samples / "sample.zelopt");
     AllOptions options;
     if (!ZelOptFile().readBytes(options, sampleOptions)) {
