@@ -1,7 +1,8 @@
 #include "files/LibraryConversion.hpp"
 
+#include "files/SinkWriter.hpp"
+
 #include <dexmor/materials/MaterialAssets.hpp>
-#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <algorithm>
 #include <string>
@@ -9,9 +10,6 @@
 namespace OrvexKavorCore {
 
 namespace {
-
-// The writer sends its text on in pieces of about this size.
-constexpr std::size_t kPieceSize = 64 * 1024;
 
 // A library's document is some twenty times its size: a destination that holds
 // the whole text can make room for that at once.
@@ -101,19 +99,15 @@ Diagnosis LibraryConversion::writeTo(DocumentSink& sink) {
 
 LibraryConversion::SingleReading LibraryConversion::writeReadingOnce(DocumentSink& sink, Diagnosis& result) {
     sink.expect(std::min(bytes_.size() * kExpectedGrowth, kMostExpectedAtOnce));
-    const TextSink send = [&sink](std::string_view piece) { sink.write(piece); };
-    std::string text;
-    AssetXmlWriter writer(text);
-    writer.streamTo(&send, kPieceSize);
+    SinkWriter out(sink);
     DefaultSunWatch sunWatch;
     const bool read = readMaterials(result, [&](MaterialPtr&& material) {
         if (sunWatch.changedAfterReading()) return; // the text is written again by two readings
-        writeMaterialAssets(writer, material);
+        writeMaterialAssets(out.writer(), material);
     });
     if (!read) return SingleReading::NotALibrary;
     if (sunWatch.changed()) return SingleReading::SunChanged;
-    writer.streamTo(nullptr, 0);
-    if (!text.empty()) send(text);
+    out.finish();
     return SingleReading::Written;
 }
 
@@ -127,16 +121,12 @@ void LibraryConversion::writeReadingTwice(DocumentSink& sink, Diagnosis& result)
     const SunLight finalSun = defaultSun;
     defaultSun = pristineSun;
 
-    const TextSink send = [&sink](std::string_view piece) { sink.write(piece); };
-    std::string text;
-    AssetXmlWriter writer(text);
-    writer.streamTo(&send, kPieceSize);
+    SinkWriter out(sink);
     readMaterials(result, [&](MaterialPtr&& material) {
         defaultSun = finalSun;
-        writeMaterialAssets(writer, material);
+        writeMaterialAssets(out.writer(), material);
     });
-    writer.streamTo(nullptr, 0);
-    if (!text.empty()) send(text);
+    out.finish();
 }
 
 } // namespace OrvexKavorCore

@@ -1,17 +1,14 @@
 #include "files/OptionsConversion.hpp"
 
+#include "files/SinkWriter.hpp"
+
 #include <dexmor/files/ZelOptFile.hpp>
 #include <dexmor/options/AllOptions.hpp>
-#include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <algorithm>
 #include <cstring>
 
 namespace OrvexKavorCore {
-
-namespace {
-constexpr std::size_t kPieceSize = 64 * 1024;
-} // namespace
 
 bool OptionsConversion::read(AllOptions& options, Diagnosis& result) {
     ZelOptFile file;
@@ -38,15 +35,11 @@ Diagnosis OptionsConversion::writeTo(DocumentSink& sink) {
     Diagnosis result;
     AllOptions options;
     if (!read(options, result)) return result;
-    const TextSink send = [&sink](std::string_view piece) { sink.write(piece); };
-    std::string text;
-    AssetXmlWriter writer(text);
-    writer.streamTo(&send, kPieceSize);
-    writer.beginDocument();
-    options.writeXml(writer, "");
-    writer.endDocument();
-    writer.streamTo(nullptr, 0);
-    if (!text.empty()) send(text);
+    SinkWriter out(sink);
+    out.writer().beginDocument();
+    options.writeXml(out.writer(), "");
+    out.writer().endDocument();
+    out.finish();
     return result;
 }
 

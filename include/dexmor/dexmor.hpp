@@ -70,6 +70,9 @@ public:
     virtual void takeBack() {}
     // A hint: about this many more bytes are coming.
     virtual void expect(std::size_t /*bytes*/) {}
+    // The string that holds the whole document, for a sink that has one: the
+    // conversion then writes into it directly instead of sending pieces.
+    virtual std::string* wholeText() { return nullptr; }
 };
 
 // Appends the document to a string.
@@ -80,6 +83,7 @@ public:
     bool canTakeBack() const override { return true; }
     void takeBack() override { document_.resize(start_); }
     void expect(std::size_t bytes) override;
+    std::string* wholeText() override { return &document_; }
 
 private:
     std::string& document_;
