@@ -10,9 +10,12 @@
 #include <dexmor/textures/SkyTexture.hpp>
 #include <dexmor/xml/AssetXmlWriter.hpp>
 
+#include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <sstream>
+
+#include <unistd.h>
 
 using namespace materialtest;
 using namespace testsupport;
@@ -75,7 +78,7 @@ std::string sample(const char* name) {
 
 using Conversions = LibraryTest;
 
-TEST_F(Conversions, StreamingSendsEachMaterialAndMatchesTheWholeDocument) {
+TEST_F(Conversions, ReadOnceOrTwiceTheDocumentIsTheSame) {
     // Both skies store the default sun with turbidity 7.5; the last stored one is
     // changed to 9.25. Both skies show the default sun as the last sky record
     // left it, although the first is written before the second is read again.
@@ -139,6 +142,44 @@ TEST_F(Conversions, ADefaultSunChangedOnlyFromZeroToMinusZeroGivesOneDocument) {
     const std::string once = convertBytesToXml(FileKind::MaterialLibrary, bytes);
     EXPECT_EQ(once, streamedXml(FileKind::MaterialLibrary, bytes));
     EXPECT_NE(once.find("<value>-0</value>"), std::string::npos);
+}
+
+TEST_F(Conversions, TextReachesTheSinkInPiecesOfBoundedSizeEvenWithinOneMaterial) {
+    // One material of 3,000 layers: its text alone is far above a piece.
+    auto material = make<MaterialLayeredBRDF>("many");
+    for (int i = 0; i < 3000; ++i) material->layers.push_back(boost::make_shared<Diffuse_BRDF>());
+    const std::string bytes = libraryBytes({material});
+    const std::vector<std::string> pieces = streamedPieces(FileKind::MaterialLibrary, bytes);
+    std::string joined;
+    for (const std::string& piece : pieces) {
+        EXPECT_LE(piece.size(), std::size_t{72} * 1024);
+        joined += piece;
+    }
+    EXPECT_GT(pieces.size(), 10u);
+    EXPECT_EQ(joined, convertBytesToXml(FileKind::MaterialLibrary, bytes));
+}
+
+TEST_F(Conversions, AnAtomicFileAppearsWholeOnlyOnCommit) {
+    const std::filesystem::path dir = std::filesystem::temp_directory_path() / ("dexmor-sink-" + std::to_string(::getpid()));
+    std::filesystem::create_directories(dir);
+    const std::filesystem::path target = dir / "out.xml";
+    const std::string bytes = libraryBytes({make<MaterialLayeredBRDF>("a"), make<MaterialLayeredBRDF>("b")});
+    {
+        AtomicFileSink sink(target);
+        EXPECT_TRUE(convert(FileKind::MaterialLibrary, Input::ofBytes(bytes), sink).readsAsBinary);
+        EXPECT_FALSE(std::filesystem::exists(target)); // nothing in place before the commit
+    }
+    EXPECT_TRUE(std::filesystem::is_empty(dir)); // and no temporary left behind
+    {
+        AtomicFileSink sink(target);
+        convert(FileKind::MaterialLibrary, Input::ofBytes(bytes), sink);
+        std::string error;
+        ASSERT_TRUE(sink.commit(&error)) << error;
+        EXPECT_EQ(sink.bytesWritten(), convertBytesToXml(FileKind::MaterialLibrary, bytes).size());
+    }
+    std::ifstream in(target, std::ios::binary);
+    EXPECT_EQ(std::string(std::istreambuf_iterator<char>(in), {}), convertBytesToXml(FileKind::MaterialLibrary, bytes));
+    std::filesystem::remove_all(dir);
 }
 
 TEST_F(Conversions, DiagnosisSaysWhatAFileHoldsOrWhyItDidNotRead) {
