@@ -46,3 +46,16 @@ def test_a_public_header_must_not_reach_a_private_one_and_must_be_listed(tmp_pat
     result = run(root)
     assert "include/dexmor/params/Extra.hpp:2: a public header includes the private header" in result.stdout
     assert "include/dexmor/params/Extra.hpp: not listed" in result.stdout
+
+
+def test_the_front_header_needs_no_boost():
+    # The generated version header is in the build tree, beside the tool.
+    build = pathlib.Path(os.environ["DEXMOR_CLI"]).resolve().parents[1]
+    compiler = shutil.which("c++") or shutil.which("g++")
+    result = subprocess.run(
+        [compiler, "-std=c++20", "-x", "c++", "-fsyntax-only", "-H", f"-I{SOURCE / 'include'}",
+         f"-I{build / 'include'}", "-"],
+        input="#include <dexmor/dexmor.hpp>\n", capture_output=True, text=True)
+    assert result.returncode == 0, result.stderr
+    included = [line for line in result.stderr.splitlines() if line.startswith(".")]
+    assert included and not [line for line in included if "boost/" in line]
