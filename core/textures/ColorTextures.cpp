@@ -6,12 +6,12 @@ namespace OrvexKavorCore {
 
 namespace {
 
+using kind::reference;
+using kind::value;
 using record::field;
 using record::since;
 using texture::mandatory;
 using texture::optional;
-using kind::reference;
-using kind::value;
 
 // --- AColorTexture ---
 
