@@ -9,51 +9,57 @@ namespace OrvexKavorCore {
 
 namespace {
 
-#define LIGHT_FIELD(member, ...) record::field<&SunLight::member>(#member __VA_OPT__(, ) __VA_ARGS__)
-#define LIGHT_PARAM(member) lightxml::param<&SunLight::member>(#member)
-
+using kind::value;
 using record::between;
+using record::field;
 using record::since;
 
 // Record version 4. Versions 1 to 3 store the placement first, as a plain
 // Transform that becomes its value at time 0; version 4 stores its record last.
 constexpr std::array kFields = {
     record::fieldAs<record::AnimatedPlainValue, &SunLight::transform>("transform (plain)", between(1, 3)),
-    LIGHT_FIELD(up_vector),
-    LIGHT_FIELD(shadowBias),
-    LIGHT_FIELD(turbidity),
-    LIGHT_FIELD(water_vapour),
-    LIGHT_FIELD(intensity_multiplier),
-    LIGHT_FIELD(size_multiplier),
-    LIGHT_FIELD(photon_radius),
-    LIGHT_FIELD(photon_emit_distance),
-    LIGHT_FIELD(ozone),
-    LIGHT_FIELD(photonSubdivs),
-    LIGHT_FIELD(causticSubdivs),
-    LIGHT_FIELD(shadow_subdivs),
-    LIGHT_FIELD(shadows),
-    LIGHT_FIELD(identifier, since(2)),
-    LIGHT_FIELD(name, since(2)),
-    LIGHT_FIELD(enabled, since(3)),
-    LIGHT_FIELD(invisible, since(3)),
-    LIGHT_FIELD(transform, since(4)),
+    field<&SunLight::up_vector>("up_vector"),
+    field<&SunLight::shadowBias>("shadowBias"),
+    field<&SunLight::turbidity>("turbidity"),
+    field<&SunLight::water_vapour>("water_vapour"),
+    field<&SunLight::intensity_multiplier>("intensity_multiplier"),
+    field<&SunLight::size_multiplier>("size_multiplier"),
+    field<&SunLight::photon_radius>("photon_radius"),
+    field<&SunLight::photon_emit_distance>("photon_emit_distance"),
+    field<&SunLight::ozone>("ozone"),
+    field<&SunLight::photonSubdivs>("photonSubdivs"),
+    field<&SunLight::causticSubdivs>("causticSubdivs"),
+    field<&SunLight::shadow_subdivs>("shadow_subdivs"),
+    field<&SunLight::shadows>("shadows"),
+    field<&SunLight::identifier>("identifier", since(2)),
+    field<&SunLight::name>("name", since(2)),
+    field<&SunLight::enabled>("enabled", since(3)),
+    field<&SunLight::invisible>("invisible", since(3)),
+    field<&SunLight::transform>("transform", since(4)),
 };
 
 constexpr std::array kXml = {
-    LIGHT_PARAM(up_vector),     LIGHT_PARAM(shadowBias),           LIGHT_PARAM(turbidity),
-    LIGHT_PARAM(water_vapour),  LIGHT_PARAM(intensity_multiplier), LIGHT_PARAM(size_multiplier),
-    LIGHT_PARAM(photon_radius), LIGHT_PARAM(photon_emit_distance), LIGHT_PARAM(ozone),
-    LIGHT_PARAM(photonSubdivs), LIGHT_PARAM(causticSubdivs),       LIGHT_PARAM(shadow_subdivs),
-    LIGHT_PARAM(enabled),       LIGHT_PARAM(shadows),              LIGHT_PARAM(invisible),
+    value<&SunLight::up_vector>("up_vector"),
+    value<&SunLight::shadowBias>("shadowBias"),
+    value<&SunLight::turbidity>("turbidity"),
+    value<&SunLight::water_vapour>("water_vapour"),
+    value<&SunLight::intensity_multiplier>("intensity_multiplier"),
+    value<&SunLight::size_multiplier>("size_multiplier"),
+    value<&SunLight::photon_radius>("photon_radius"),
+    value<&SunLight::photon_emit_distance>("photon_emit_distance"),
+    value<&SunLight::ozone>("ozone"),
+    value<&SunLight::photonSubdivs>("photonSubdivs"),
+    value<&SunLight::causticSubdivs>("causticSubdivs"),
+    value<&SunLight::shadow_subdivs>("shadow_subdivs"),
+    value<&SunLight::enabled>("enabled"),
+    value<&SunLight::shadows>("shadows"),
+    value<&SunLight::invisible>("invisible"),
 };
-
-#undef LIGHT_FIELD
-#undef LIGHT_PARAM
 
 } // namespace
 
 std::span<const record::Field<SunLight>> SunLight::recordFields() { return kFields; }
-std::span<const lightxml::Parameter<SunLight>> SunLight::xmlParameters() { return kXml; }
+std::span<const kind::ParameterRow<SunLight>> SunLight::xmlParameters() { return kXml; }
 
 SunLight::SunLight(std::string sunName, std::string sunIdentifier)
     : identifier(std::move(sunIdentifier)), name(std::move(sunName)) {}

@@ -1,6 +1,7 @@
 #include <dexmor/textures/BitmapBuffer.hpp>
 
 #include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/model/Kind.hpp>
 #include <dexmor/platform/Text.hpp>
 #include <dexmor/xml/AssetXmlWriter.hpp>
 
@@ -33,10 +34,7 @@ bool BitmapBuffer::writeToArchive(QuickArchive& ar) {
 }
 
 bool BitmapBuffer::readFromArchive(QuickArchive& ar) {
-    const auto version = ar.get<VersionWord>();
-    if (version != kVersion)
-        return ar.fail("unknown bitmap buffer version (" + std::to_string(version.first()) + ", " +
-                       std::to_string(version.second()) + ")");
+    if (!ar.readVersion(kVersion.second(), "bitmap buffer")) return false;
     ar.read(filter_type);
     ar.read(filter_blur);
     ar.read(gamma);
@@ -54,16 +52,12 @@ bool BitmapBuffer::isEqual(const BitmapPtr& other) const {
 }
 
 void BitmapBuffer::writeXml(AssetXmlWriter& writer, std::string url) {
-    writer.beginAsset(url, assetType(), "");
-    writer.beginPlugin(pluginType(), assetType());
-    writer.beginParameters();
+    kind::beginAsset(writer, url, assetType(), pluginType());
     writer.writeInteger("filter_type", filter_type);
     writer.writeFloat("filter_blur", filter_blur);
     writer.writeFloat("gamma", gamma);
     writer.writeString("file", file);
-    writer.endParameters();
-    writer.endPlugin();
-    writer.endAsset();
+    kind::endAsset(writer);
 }
 
 } // namespace OrvexKavorCore

@@ -13,9 +13,9 @@ constexpr std::array kBitmapMembers = {
 };
 constexpr std::array kBitmapFields = {record::field<&BitmapTexture::tile>("tile")};
 constexpr std::array kBitmapParameters = {
-    texture::reference<&BitmapTexture::uvwgen>("uvwgen", "uvwgen"),
-    texture::reference<&BitmapTexture::bitmap>("bitmap", "buffer"),
-    texture::value<&BitmapTexture::tile>("tile"),
+    kind::reference<&BitmapTexture::uvwgen>("uvwgen", "uvwgen"),
+    kind::reference<&BitmapTexture::bitmap>("bitmap", "buffer"),
+    kind::value<&BitmapTexture::tile>("tile"),
 };
 
 // The record of a member whose object was already created from its kind id.
@@ -29,7 +29,7 @@ bool readCreated(QuickArchive& ar, const boost::shared_ptr<Base>& object, const 
 
 std::span<const texture::Member<BitmapTexture>> BitmapTexture::members() { return kBitmapMembers; }
 std::span<const record::Field<BitmapTexture>> BitmapTexture::fields() { return kBitmapFields; }
-std::span<const texture::Parameter<BitmapTexture>> BitmapTexture::parameters() { return kBitmapParameters; }
+std::span<const kind::ParameterRow<BitmapTexture>> BitmapTexture::parameters() { return kBitmapParameters; }
 
 bool BitmapTexture::writeToArchive(QuickArchive& ar) {
     if (!uvwgen || !bitmap) return false;
@@ -42,9 +42,8 @@ bool BitmapTexture::writeToArchive(QuickArchive& ar) {
 }
 
 bool BitmapTexture::readFromArchive(QuickArchive& ar) {
-    const auto version = ar.get<VersionWord>();
-    resetToDefaults();
-    if (!accepts(version)) return texture::refuseVersion(ar, kInfo.what, version);
+    const auto version = startRead(ar);
+    if (!version) return false;
     // Each kind id is checked as soon as it is read, so a failure points at it.
     const auto uvwKind = ar.get<std::int32_t>();
     const UVWPtr newUvwgen = createUVW(uvwKind);

@@ -6,12 +6,12 @@ namespace OrvexKavorCore {
 
 namespace {
 
+using kind::reference;
+using kind::value;
 using record::field;
 using record::since;
 using texture::mandatory;
 using texture::optional;
-using texture::reference;
-using texture::value;
 
 // --- AColorTexture ---
 
@@ -51,7 +51,7 @@ constexpr std::array kFresnelParameters = {
     reference<&FresnelTexture::fresnel_ior_tex>("fresnel_ior_tex", "fresnel_ior_tex"),
     reference<&FresnelTexture::refract_ior_tex>("refract_ior_tex", "refract_ior_tex"),
     // The consumers expect the old Fresnel evaluation, whatever the record held.
-    texture::Parameter<FresnelTexture>{"old_way", nullptr, nullptr, nullptr,
+    kind::ParameterRow<FresnelTexture>{"old_way", nullptr, nullptr, nullptr,
                                        [](AssetXmlWriter& w, const char* n, const FresnelTexture&,
                                           const std::string&) { w.writeBool(n, true); }},
 };
@@ -86,19 +86,19 @@ constexpr std::array kBlendParameters = {
 
 std::span<const texture::Member<AColorTexture>> AColorTexture::members() { return kAColorMembers; }
 std::span<const record::Field<AColorTexture>> AColorTexture::fields() { return kAColorFields; }
-std::span<const texture::Parameter<AColorTexture>> AColorTexture::parameters() { return kAColorParameters; }
+std::span<const kind::ParameterRow<AColorTexture>> AColorTexture::parameters() { return kAColorParameters; }
 
 std::span<const texture::Member<FresnelTexture>> FresnelTexture::members() { return kFresnelMembers; }
 std::span<const record::Field<FresnelTexture>> FresnelTexture::fields() { return kFresnelFields; }
-std::span<const texture::Parameter<FresnelTexture>> FresnelTexture::parameters() { return kFresnelParameters; }
+std::span<const kind::ParameterRow<FresnelTexture>> FresnelTexture::parameters() { return kFresnelParameters; }
 
 std::span<const texture::Member<InvertTexture>> InvertTexture::members() { return kInvertMembers; }
 std::span<const record::Field<InvertTexture>> InvertTexture::fields() { return kInvertFields; }
-std::span<const texture::Parameter<InvertTexture>> InvertTexture::parameters() { return kInvertParameters; }
+std::span<const kind::ParameterRow<InvertTexture>> InvertTexture::parameters() { return kInvertParameters; }
 
 std::span<const texture::Member<BlendTexture>> BlendTexture::members() { return kBlendMembers; }
 std::span<const record::Field<BlendTexture>> BlendTexture::fields() { return kBlendFields; }
-std::span<const texture::Parameter<BlendTexture>> BlendTexture::parameters() { return kBlendParameters; }
+std::span<const kind::ParameterRow<BlendTexture>> BlendTexture::parameters() { return kBlendParameters; }
 
 // --- the blend texture's record ---
 
@@ -115,10 +115,9 @@ bool BlendTexture::writeToArchive(QuickArchive& ar) {
 }
 
 bool BlendTexture::readFromArchive(QuickArchive& ar) {
-    const auto version = ar.get<VersionWord>();
-    resetToDefaults();
-    if (!accepts(version)) return texture::refuseVersion(ar, kInfo.what, version);
-    const bool withFactors = version.second() >= 2;
+    const auto version = startRead(ar);
+    if (!version) return false;
+    const bool withFactors = *version >= 2;
     if (!readOptionalMember(ar, color_a, "color_a")) return false;
     if (withFactors && color_a) ar.read(colorAFactor);
     if (!readOptionalMember(ar, color_b, "color_b")) return false;

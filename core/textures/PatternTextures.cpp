@@ -6,12 +6,12 @@ namespace OrvexKavorCore {
 
 namespace {
 
+using kind::reference;
+using kind::value;
 using record::field;
 using record::since;
 using texture::mandatory;
 using texture::optional;
-using texture::reference;
-using texture::value;
 
 // --- UVWTexture ---
 
@@ -168,30 +168,30 @@ constexpr std::array kRampParameters = {
 
 std::span<const texture::Member<UVWTexture>> UVWTexture::members() { return kUVWMembers; }
 std::span<const record::Field<UVWTexture>> UVWTexture::fields() { return kUVWFields; }
-std::span<const texture::Parameter<UVWTexture>> UVWTexture::parameters() { return kUVWParameters; }
+std::span<const kind::ParameterRow<UVWTexture>> UVWTexture::parameters() { return kUVWParameters; }
 
 std::span<const texture::Member<NoiseTexture>> NoiseTexture::members() { return kNoiseMembers; }
 std::span<const record::Field<NoiseTexture>> NoiseTexture::fields() { return kNoiseFields; }
-std::span<const texture::Parameter<NoiseTexture>> NoiseTexture::parameters() { return kNoiseParameters; }
+std::span<const kind::ParameterRow<NoiseTexture>> NoiseTexture::parameters() { return kNoiseParameters; }
 
 std::span<const texture::Member<CheckerTexture>> CheckerTexture::members() { return kCheckerMembers; }
 std::span<const record::Field<CheckerTexture>> CheckerTexture::fields() { return kCheckerFields; }
-std::span<const texture::Parameter<CheckerTexture>> CheckerTexture::parameters() { return kCheckerParameters; }
+std::span<const kind::ParameterRow<CheckerTexture>> CheckerTexture::parameters() { return kCheckerParameters; }
 
 std::span<const texture::Member<GridTexture>> GridTexture::members() { return kGridMembers; }
 std::span<const record::Field<GridTexture>> GridTexture::fields() { return kGridFields; }
-std::span<const texture::Parameter<GridTexture>> GridTexture::parameters() { return kGridParameters; }
+std::span<const kind::ParameterRow<GridTexture>> GridTexture::parameters() { return kGridParameters; }
 
 std::span<const texture::Member<ClothTexture>> ClothTexture::members() { return kClothMembers; }
 std::span<const record::Field<ClothTexture>> ClothTexture::fields() { return kClothFields; }
-std::span<const texture::Parameter<ClothTexture>> ClothTexture::parameters() { return kClothParameters; }
+std::span<const kind::ParameterRow<ClothTexture>> ClothTexture::parameters() { return kClothParameters; }
 
 std::span<const texture::Member<BulgeTexture>> BulgeTexture::members() { return kBulgeMembers; }
 std::span<const record::Field<BulgeTexture>> BulgeTexture::fields() { return kBulgeFields; }
-std::span<const texture::Parameter<BulgeTexture>> BulgeTexture::parameters() { return kBulgeParameters; }
+std::span<const kind::ParameterRow<BulgeTexture>> BulgeTexture::parameters() { return kBulgeParameters; }
 
 std::span<const texture::Member<RampTexture>> RampTexture::members() { return kRampMembers; }
 std::span<const record::Field<RampTexture>> RampTexture::fields() { return kRampFields; }
-std::span<const texture::Parameter<RampTexture>> RampTexture::parameters() { return kRampParameters; }
+std::span<const kind::ParameterRow<RampTexture>> RampTexture::parameters() { return kRampParameters; }
 
 } // namespace OrvexKavorCore

@@ -52,7 +52,7 @@ constexpr std::array kSkyFields = {
 // "sun" holds the url under which the document wrote the sun (the empty text when
 // it wrote none for it).
 constexpr std::array kSkyParameters = {
-    texture::Parameter<SkyTexture>{
+    kind::ParameterRow<SkyTexture>{
         "sun", nullptr, nullptr, nullptr,
         [](AssetXmlWriter& w, const char* n, const SkyTexture& sky, const std::string&) {
             std::string sunUrl;
@@ -73,7 +73,7 @@ boost::shared_ptr<SunLight> sharedDefaultSun() { return PerConversion<DefaultSun
 
 std::span<const texture::Member<SkyTexture>> SkyTexture::members() { return kSkyMembers; }
 std::span<const record::Field<SkyTexture>> SkyTexture::fields() { return kSkyFields; }
-std::span<const texture::Parameter<SkyTexture>> SkyTexture::parameters() { return kSkyParameters; }
+std::span<const kind::ParameterRow<SkyTexture>> SkyTexture::parameters() { return kSkyParameters; }
 
 SunLight* SkyTexture::sunLight() const {
     if (!sun || sun->kindId() != BaseLight::kSun) return nullptr;
@@ -102,10 +102,9 @@ bool SkyTexture::writeToArchive(QuickArchive& ar) {
 }
 
 bool SkyTexture::readFromArchive(QuickArchive& ar) {
-    const auto version = ar.get<VersionWord>();
-    resetToDefaults();
-    if (!accepts(version)) return texture::refuseVersion(ar, kInfo.what, version);
-    const unsigned v = version.second();
+    const auto version = startRead(ar);
+    if (!version) return false;
+    const unsigned v = *version;
 
     // The sky's own sun. Its failure is not the sky's: the record goes on after it.
     if (ar.get<bool>()) {

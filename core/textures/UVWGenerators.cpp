@@ -1,6 +1,7 @@
 #include <dexmor/textures/UVWGenerators.hpp>
 
 #include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/model/Kind.hpp>
 #include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <boost/make_shared.hpp>
@@ -13,28 +14,10 @@ namespace {
 
 constexpr std::array<std::string_view, 4> kMappingNames = {"angular", "cubic", "spherical", "mirror_ball"};
 
-// Records the refusal of a version word and returns false.
-bool unknownVersion(QuickArchive& ar, const char* what, VersionWord version) {
-    return ar.fail(std::string("unknown ") + what + " version (" + std::to_string(version.first()) + ", " +
-                   std::to_string(version.second()) + ")");
-}
-
 // Reads a components record, labelled for failure reports.
 bool readComponents(QuickArchive& ar, TransformComponents& components, const char* name) {
     auto scope = QuickArchive::Scope::label(ar, name);
     return components.readFromArchive(ar);
-}
-
-void beginGenerator(AssetXmlWriter& writer, const BaseUVW& uvw, const std::string& url) {
-    writer.beginAsset(url, uvw.assetType(), "");
-    writer.beginPlugin(uvw.pluginType(), uvw.assetType());
-    writer.beginParameters();
-}
-
-void endGenerator(AssetXmlWriter& writer) {
-    writer.endParameters();
-    writer.endPlugin();
-    writer.endAsset();
 }
 
 } // namespace
@@ -53,8 +36,7 @@ bool GenProjectionUVW::writeToArchive(QuickArchive& ar) {
 }
 
 bool GenProjectionUVW::readFromArchive(QuickArchive& ar) {
-    const auto version = ar.get<VersionWord>();
-    if (!version.is(0, 1)) return unknownVersion(ar, "projection UVW generator", version);
+    if (!ar.readVersion(1, "projection UVW generator")) return false;
     ar.read(uvwTransform);
     return readComponents(ar, uvwComponents, "uvwComponents");
 }
@@ -63,9 +45,9 @@ void GenProjectionUVW::updateTransforms() { uvwTransform = uvwComponents.buildTr
 
 void GenProjectionUVW::writeXml(AssetXmlWriter& writer, std::string url) {
     updateTransforms();
-    beginGenerator(writer, *this, url);
+    kind::beginAsset(writer, url, assetType(), pluginType());
     writeComponentTransform(writer, "uvw_transform", uvwComponents);
-    endGenerator(writer);
+    kind::endAsset(writer);
 }
 
 bool GenProjectionUVW::sameFields(const GenProjectionUVW& other) const {
@@ -106,11 +88,11 @@ bool GenEnvironmentUVW::writeToArchive(QuickArchive& ar) {
 //   Float32 z_rotation; Float32 x_rotation; Int32 z_mirror; Int32 x_mirror
 // The other components keep their values.
 bool GenEnvironmentUVW::readFromArchive(QuickArchive& ar) {
-    const auto version = ar.get<VersionWord>();
-    if (!version.is(0, 1) && !version.is(0, 2)) return unknownVersion(ar, "environment UVW generator", version);
+    const auto version = ar.readVersion(2, "environment UVW generator");
+    if (!version) return false;
     ar.read(uvwMatrix);
     ar.read(mappingType);
-    if (version.second() == 2) return readComponents(ar, uvwComponents, "uvwComponents");
+    if (version->second() == 2) return readComponents(ar, uvwComponents, "uvwComponents");
     ar.read(uvwComponents.z_rotation);
     ar.read(uvwComponents.x_rotation);
     ar.read(uvwComponents.z_mirror);
@@ -129,10 +111,10 @@ bool GenEnvironmentUVW::isEqual(const UVWPtr& other) const {
 
 void GenEnvironmentUVW::writeXml(AssetXmlWriter& writer, std::string url) {
     updateTransforms();
-    beginGenerator(writer, *this, url);
+    kind::beginAsset(writer, url, assetType(), pluginType());
     writeComponentMatrix(writer, "uvw_matrix", uvwComponents);
     writer.writeString("mapping_type", environmentMappingName(mappingType));
-    endGenerator(writer);
+    kind::endAsset(writer);
 }
 
 // --- channel ---
@@ -154,11 +136,11 @@ bool GenChannelUVW::writeToArchive(QuickArchive& ar) {
 //   Int32 wrap_u, wrap_v, uvw_channel
 // The other components, and all of uvwComponents, keep their values.
 bool GenChannelUVW::readFromArchive(QuickArchive& ar) {
-    const auto version = ar.get<VersionWord>();
-    if (!version.is(0, 1) && !version.is(0, 2)) return unknownVersion(ar, "channel UVW generator", version);
+    const auto version = ar.readVersion(2, "channel UVW generator");
+    if (!version) return false;
     ar.read(uvwTransform);
     ar.read(texTransform);
-    if (version.second() == 1) {
+    if (version->second() == 1) {
         ar.read(texComponents.x_rotation);
         ar.read(texComponents.y_rotation);
         ar.read(texComponents.x_mirror);
@@ -167,7 +149,7 @@ bool GenChannelUVW::readFromArchive(QuickArchive& ar) {
     ar.read(wrap_u);
     ar.read(wrap_v);
     ar.read(uvw_channel);
-    if (version.second() == 1) return true;
+    if (version->second() == 1) return true;
     return readComponents(ar, uvwComponents, "uvwComponents") && readComponents(ar, texComponents, "texComponents");
 }
 
@@ -187,13 +169,13 @@ bool GenChannelUVW::isEqual(const UVWPtr& other) const {
 
 void GenChannelUVW::writeXml(AssetXmlWriter& writer, std::string url) {
     updateTransforms();
-    beginGenerator(writer, *this, url);
+    kind::beginAsset(writer, url, assetType(), pluginType());
     writeComponentTransform(writer, "uvw_transform", uvwComponents);
     writer.writeTransform("tex_transform", texTransform);
     writer.writeInteger("wrap_u", wrap_u);
     writer.writeInteger("wrap_v", wrap_v);
     writer.writeInteger("uvw_channel", uvw_channel);
-    endGenerator(writer);
+    kind::endAsset(writer);
 }
 
 } // namespace OrvexKavorCore

@@ -19,6 +19,7 @@
 #include <dexmor/archive/QuickArchive.hpp>
 #include <dexmor/archive/Record.hpp>
 #include <dexmor/lights/BaseLight.hpp>
+#include <dexmor/model/Kind.hpp>
 #include <dexmor/platform/KavorTypes.hpp>
 
 #include <boost/make_shared.hpp>
@@ -29,75 +30,14 @@
 
 namespace OrvexKavorCore {
 
-// The fixed facts of a light kind.
-struct LightKindInfo {
-    std::int32_t kind;        // the kind id under which the factory creates it
-    std::uint16_t version;    // the current record version (the one written)
-    const char* pluginType;   // the renderer plugin; empty for a kind without XML
-    const char* what;         // the kind in failure reports ("omni light")
-};
-
-namespace lightxml {
-
-// One parameter of a light's asset: its name and how the field is written.
-template <class Light>
-struct Parameter {
-    const char* name;
-    void (*write)(AssetXmlWriter& writer, const char* name, const Light& light);
-};
-
-// The encoding follows the field's type: colours "color", vectors "vector",
-// transforms "transform", floats "float", integers and counts "integer" (a count
-// above 2^31 - 1 shows as its signed 32-bit value), flags "bool", text "string".
-void writeValue(AssetXmlWriter& writer, const char* name, const Color& value);
-void writeValue(AssetXmlWriter& writer, const char* name, const Vector& value);
-void writeValue(AssetXmlWriter& writer, const char* name, const Transform& value);
-void writeValue(AssetXmlWriter& writer, const char* name, float value);
-void writeValue(AssetXmlWriter& writer, const char* name, std::int32_t value);
-void writeValue(AssetXmlWriter& writer, const char* name, std::uint32_t value);
-void writeValue(AssetXmlWriter& writer, const char* name, bool value);
-void writeValue(AssetXmlWriter& writer, const char* name, const std::string& value);
-// Any other field type has no parameter encoding.
-template <class T>
-void writeValue(AssetXmlWriter&, const char*, const T&) = delete;
-
-template <class M>
-struct MemberClass;
-template <class C, class T>
-struct MemberClass<T C::*> {
-    using type = C;
-};
-
-// The parameter `name` showing the field `Member`:
-//   lightxml::param<&OmniLight::color>("color")
-template <auto Member>
-constexpr auto param(const char* name) {
-    using Light = typename MemberClass<decltype(Member)>::type;
-    return Parameter<Light>{name, [](AssetXmlWriter& writer, const char* n, const Light& light) {
-                                writeValue(writer, n, light.*Member);
-                            }};
-}
-
-// Opens the asset, the plugin and its parameter list / closes them again.
-void beginAsset(AssetXmlWriter& writer, const std::string& url, const std::string& pluginType);
-void endAsset(AssetXmlWriter& writer);
-
-} // namespace lightxml
-
-// Records the refusal of a light's version word; returns false.
-bool refuseLightVersion(QuickArchive& ar, const char* what, VersionWord version);
-
 // The shared implementation of a light kind. `Derived` provides
-//   static constexpr LightKindInfo kInfo;
+//   static constexpr KindInfo kInfo;
 //   static std::span<const record::Field<Derived>> recordFields();
-//   static std::span<const lightxml::Parameter<Derived>> xmlParameters();
+//   static std::span<const kind::ParameterRow<Derived>> xmlParameters();
 // and declares every stored field itself (the tables point at its members).
 template <class Derived>
-class LightKind : public BaseLight {
+class LightKind : public kind::Basics<Derived, BaseLight> {
 public:
-    std::int32_t kindId() const override { return Derived::kInfo.kind; }
-    std::string pluginType() const override { return Derived::kInfo.pluginType; }
-
     LightPtr clone() const override { return boost::make_shared<Derived>(self()); }
 
     // Same kind and every stored field equal, floats exactly.
@@ -105,8 +45,6 @@ public:
         const auto* that = dynamic_cast<const Derived*>(other.get());
         return that && record::fieldsEqual(self(), *that, Derived::recordFields());
     }
-
-    void resetToDefaults() override { self() = Derived(); }
 
     bool writeToArchive(QuickArchive& ar) override {
         constexpr std::uint16_t version = Derived::kInfo.version;
@@ -116,26 +54,24 @@ public:
 
     // A refused version leaves the light at its defaults.
     bool readFromArchive(QuickArchive& ar) override {
-        resetToDefaults();
-        const auto version = ar.get<VersionWord>();
-        if (version.first() != 0 || version.second() < 1 || version.second() > Derived::kInfo.version)
-            return refuseLightVersion(ar, Derived::kInfo.what, version);
-        return record::readFields(ar, self(), Derived::recordFields(), version.second());
+        this->resetToDefaults();
+        const auto version = ar.readVersion(Derived::kInfo.version, Derived::kInfo.what);
+        return version && record::readFields(ar, self(), Derived::recordFields(), version->second());
     }
 
     // The asset under path + "/" + plugin type. A kind without XML parameters
     // writes nothing.
     void writeXml(AssetXmlWriter& writer, std::string path) override {
         if (Derived::xmlParameters().empty()) return;
-        writeAsset(writer, path + "/" + pluginType());
+        writeAsset(writer, path + "/" + this->pluginType());
     }
 
 protected:
     // The asset, its plugin and every XML parameter, under `url`.
     void writeAsset(AssetXmlWriter& writer, const std::string& url) const {
-        lightxml::beginAsset(writer, url, pluginType());
-        for (const lightxml::Parameter<Derived>& p : Derived::xmlParameters()) p.write(writer, p.name, self());
-        lightxml::endAsset(writer);
+        kind::beginAsset(writer, url, "light", Derived::kInfo.pluginType);
+        kind::writeParameters(writer, self(), url, Derived::xmlParameters());
+        kind::endAsset(writer);
     }
 
 private:

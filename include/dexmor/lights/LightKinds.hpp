@@ -20,9 +20,9 @@ namespace OrvexKavorCore {
 // An infinitely distant directional light. Its placement is animated.
 class MayaDirectLight final : public LightKind<MayaDirectLight> {
 public:
-    static constexpr LightKindInfo kInfo{kMayaDirect, 4, "MayaLightDirect", "directional light"};
+    static constexpr KindInfo kInfo{kMayaDirect, 4, "MayaLightDirect", "directional light"};
     static std::span<const record::Field<MayaDirectLight>> recordFields();
-    static std::span<const lightxml::Parameter<MayaDirectLight>> xmlParameters();
+    static std::span<const kind::ParameterRow<MayaDirectLight>> xmlParameters();
 
     AnimatedTransform transform; // the identity at time 0
     Color color{1.0f, 1.0f, 1.0f};
@@ -42,9 +42,9 @@ public:
 // A point light shining in every direction.
 class OmniLight final : public LightKind<OmniLight> {
 public:
-    static constexpr LightKindInfo kInfo{kOmni, 4, "LightOmni", "omni light"};
+    static constexpr KindInfo kInfo{kOmni, 4, "LightOmni", "omni light"};
     static std::span<const record::Field<OmniLight>> recordFields();
-    static std::span<const lightxml::Parameter<OmniLight>> xmlParameters();
+    static std::span<const kind::ParameterRow<OmniLight>> xmlParameters();
 
     Transform transform = Transform::identity();
     Color color{1.0f, 1.0f, 1.0f};
@@ -69,9 +69,9 @@ public:
 // A cone of light with optional barn doors.
 class SpotLight final : public LightKind<SpotLight> {
 public:
-    static constexpr LightKindInfo kInfo{kSpot, 4, "LightSpot", "spot light"};
+    static constexpr KindInfo kInfo{kSpot, 4, "LightSpot", "spot light"};
     static std::span<const record::Field<SpotLight>> recordFields();
-    static std::span<const lightxml::Parameter<SpotLight>> xmlParameters();
+    static std::span<const kind::ParameterRow<SpotLight>> xmlParameters();
 
     Transform transform = Transform::identity();
     Color color{1.0f, 1.0f, 1.0f};
@@ -103,9 +103,9 @@ public:
 // An area light of u_size by v_size.
 class RectangleLight final : public LightKind<RectangleLight> {
 public:
-    static constexpr LightKindInfo kInfo{kRectangle, 4, "LightRectangle", "rectangle light"};
+    static constexpr KindInfo kInfo{kRectangle, 4, "LightRectangle", "rectangle light"};
     static std::span<const record::Field<RectangleLight>> recordFields();
-    static std::span<const lightxml::Parameter<RectangleLight>> xmlParameters();
+    static std::span<const kind::ParameterRow<RectangleLight>> xmlParameters();
 
     Transform transform = Transform::identity();
     Color color{1.0f, 1.0f, 1.0f};
@@ -137,9 +137,9 @@ public:
 // A photometric light whose distribution comes from an IES file.
 class IESLight final : public LightKind<IESLight> {
 public:
-    static constexpr LightKindInfo kInfo{kIES, 3, "LightIES", "IES light"};
+    static constexpr KindInfo kInfo{kIES, 3, "LightIES", "IES light"};
     static std::span<const record::Field<IESLight>> recordFields();
-    static std::span<const lightxml::Parameter<IESLight>> xmlParameters();
+    static std::span<const kind::ParameterRow<IESLight>> xmlParameters();
 
     Transform transform = Transform::identity();
     Color color{1.0f, 1.0f, 1.0f};
@@ -162,9 +162,9 @@ public:
 // A spherical light. It is only stored: it has no plugin and writes no XML.
 class SphereLight final : public LightKind<SphereLight> {
 public:
-    static constexpr LightKindInfo kInfo{kSphere, 2, "", "sphere light"};
+    static constexpr KindInfo kInfo{kSphere, 2, "", "sphere light"};
     static std::span<const record::Field<SphereLight>> recordFields();
-    static std::span<const lightxml::Parameter<SphereLight>> xmlParameters();
+    static std::span<const kind::ParameterRow<SphereLight>> xmlParameters();
 
     Transform transform = Transform::identity();
     Color color{1.0f, 1.0f, 1.0f};

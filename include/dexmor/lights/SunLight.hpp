@@ -26,9 +26,9 @@ namespace OrvexKavorCore {
 
 class SunLight final : public LightKind<SunLight> {
 public:
-    static constexpr LightKindInfo kInfo{kSun, 4, "SunLight", "sun light"};
+    static constexpr KindInfo kInfo{kSun, 4, "SunLight", "sun light"};
     static std::span<const record::Field<SunLight>> recordFields();
-    static std::span<const lightxml::Parameter<SunLight>> xmlParameters();
+    static std::span<const kind::ParameterRow<SunLight>> xmlParameters();
 
     // The defaults, with a newly generated identifier.
     SunLight() = default;

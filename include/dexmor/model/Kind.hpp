@@ -129,6 +129,16 @@ void beginAsset(AssetXmlWriter& writer, std::string_view url, std::string_view a
                 std::string_view layout = {});
 void endAsset(AssetXmlWriter& writer);
 
+// The family base `Base` with what follows from the kind's KindInfo alone: its kind
+// id, its plugin type, and the reset to the defaults of its class.
+template <class Derived, class Base>
+class Basics : public Base {
+public:
+    std::int32_t kindId() const override { return Derived::kInfo.kind; }
+    std::string pluginType() const override { return Derived::kInfo.pluginType; }
+    void resetToDefaults() override { static_cast<Derived&>(*this) = Derived(); }
+};
+
 } // namespace kind
 
 } // namespace OrvexKavorCore

@@ -20,8 +20,8 @@ namespace OrvexKavorCore {
 
 class BitmapTexture final : public TextureKind<BitmapTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kBitmap, .version = 1, .pluginType = "TexBitmap",
-                                           .what = "bitmap texture"};
+    static constexpr KindInfo kInfo{.kind = kBitmap, .version = 1, .pluginType = "TexBitmap",
+                                    .what = "bitmap texture"};
 
     UVWPtr uvwgen;
     BitmapPtr bitmap;
@@ -32,7 +32,7 @@ public:
 
     static std::span<const texture::Member<BitmapTexture>> members();
     static std::span<const record::Field<BitmapTexture>> fields();
-    static std::span<const texture::Parameter<BitmapTexture>> parameters();
+    static std::span<const kind::ParameterRow<BitmapTexture>> parameters();
 };
 
 } // namespace OrvexKavorCore

@@ -25,8 +25,8 @@ namespace OrvexKavorCore {
 // One constant colour with alpha.
 class AColorTexture final : public TextureKind<AColorTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kAColor, .version = 1, .pluginType = "TexAColor",
-                                           .what = "colour texture"};
+    static constexpr KindInfo kInfo{.kind = kAColor, .version = 1, .pluginType = "TexAColor",
+                                    .what = "colour texture"};
 
     AColor texture{1.0f, 1.0f, 1.0f, 1.0f};
 
@@ -35,7 +35,7 @@ public:
 
     static std::span<const texture::Member<AColorTexture>> members();
     static std::span<const record::Field<AColorTexture>> fields();
-    static std::span<const texture::Parameter<AColorTexture>> parameters();
+    static std::span<const kind::ParameterRow<AColorTexture>> parameters();
 };
 
 // Blends two colours by the Fresnel term of an index of refraction. Its asset
@@ -43,8 +43,8 @@ public:
 // child assets "reflection_tex" and "refraction_tex".
 class FresnelTexture final : public TextureKind<FresnelTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kFresnel, .version = 2, .pluginType = "TexFresnel",
-                                           .what = "Fresnel texture", .membersFirst = false};
+    static constexpr KindInfo kInfo{.kind = kFresnel, .version = 2, .pluginType = "TexFresnel",
+                                    .what = "Fresnel texture", .membersFirst = false};
 
     TexturePtr black_color_tex;
     TexturePtr white_color_tex;
@@ -66,14 +66,14 @@ public:
 
     static std::span<const texture::Member<FresnelTexture>> members();
     static std::span<const record::Field<FresnelTexture>> fields();
-    static std::span<const texture::Parameter<FresnelTexture>> parameters();
+    static std::span<const kind::ParameterRow<FresnelTexture>> parameters();
 };
 
 // The inverse of another texture, written as the child asset "base_texture".
 class InvertTexture final : public TextureKind<InvertTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kInvert, .version = 1, .pluginType = "TexInvert",
-                                           .what = "invert texture"};
+    static constexpr KindInfo kInfo{.kind = kInvert, .version = 1, .pluginType = "TexInvert",
+                                    .what = "invert texture"};
 
     TexturePtr texture;
     bool invert_alpha = false;
@@ -85,7 +85,7 @@ public:
 
     static std::span<const texture::Member<InvertTexture>> members();
     static std::span<const record::Field<InvertTexture>> fields();
-    static std::span<const texture::Parameter<InvertTexture>> parameters();
+    static std::span<const kind::ParameterRow<InvertTexture>> parameters();
 };
 
 // A mix of two textures. Each factor is stored right after its texture and only
@@ -93,8 +93,8 @@ public:
 // colorAFactor at 1.0.
 class BlendTexture final : public TextureKind<BlendTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kBlend, .version = 2, .pluginType = "TexBlend",
-                                           .what = "blend texture"};
+    static constexpr KindInfo kInfo{.kind = kBlend, .version = 2, .pluginType = "TexBlend",
+                                    .what = "blend texture"};
 
     TexturePtr color_a;
     TexturePtr color_b;
@@ -113,7 +113,7 @@ public:
     static std::span<const texture::Member<BlendTexture>> members();
     // For comparison; the record is written by hand.
     static std::span<const record::Field<BlendTexture>> fields();
-    static std::span<const texture::Parameter<BlendTexture>> parameters();
+    static std::span<const kind::ParameterRow<BlendTexture>> parameters();
 };
 
 } // namespace OrvexKavorCore

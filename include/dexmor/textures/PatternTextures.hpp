@@ -36,19 +36,19 @@ namespace OrvexKavorCore {
 // The UVW coordinates themselves as a colour.
 class UVWTexture final : public TextureKind<UVWTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kUVW, .version = 1, .pluginType = "TexUVW", .what = "UVW texture"};
+    static constexpr KindInfo kInfo{.kind = kUVW, .version = 1, .pluginType = "TexUVW", .what = "UVW texture"};
 
     UVWPtr uvwgen;
 
     static std::span<const texture::Member<UVWTexture>> members();
     static std::span<const record::Field<UVWTexture>> fields();
-    static std::span<const texture::Parameter<UVWTexture>> parameters();
+    static std::span<const kind::ParameterRow<UVWTexture>> parameters();
 };
 
 class NoiseTexture final : public TextureKind<NoiseTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kNoise, .version = 1, .pluginType = "TexNoise",
-                                           .what = "noise texture"};
+    static constexpr KindInfo kInfo{.kind = kNoise, .version = 1, .pluginType = "TexNoise",
+                                    .what = "noise texture"};
 
     UVWPtr uvwgen;
     TexturePtr color1_tex;
@@ -76,7 +76,7 @@ public:
 
     static std::span<const texture::Member<NoiseTexture>> members();
     static std::span<const record::Field<NoiseTexture>> fields();
-    static std::span<const texture::Parameter<NoiseTexture>> parameters();
+    static std::span<const kind::ParameterRow<NoiseTexture>> parameters();
 };
 
 // Two colours in alternating squares. A new checker holds a planar world
@@ -84,8 +84,8 @@ public:
 // reset makes new ones.
 class CheckerTexture final : public TextureKind<CheckerTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kChecker, .version = 2, .pluginType = "TexChecker",
-                                           .what = "checker texture"};
+    static constexpr KindInfo kInfo{.kind = kChecker, .version = 2, .pluginType = "TexChecker",
+                                    .what = "checker texture"};
 
     UVWPtr uvwgen = boost::make_shared<GenPlanarWorldUVW>();
     TexturePtr white_color = boost::make_shared<AColorTexture>(AColor{1.0f, 1.0f, 1.0f, 1.0f});
@@ -102,14 +102,14 @@ public:
 
     static std::span<const texture::Member<CheckerTexture>> members();
     static std::span<const record::Field<CheckerTexture>> fields();
-    static std::span<const texture::Parameter<CheckerTexture>> parameters();
+    static std::span<const kind::ParameterRow<CheckerTexture>> parameters();
 };
 
 // Lines of one colour over a fill of another.
 class GridTexture final : public TextureKind<GridTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kGrid, .version = 2, .pluginType = "TexGrid",
-                                           .what = "grid texture"};
+    static constexpr KindInfo kInfo{.kind = kGrid, .version = 2, .pluginType = "TexGrid",
+                                    .what = "grid texture"};
 
     UVWPtr uvwgen;
     TexturePtr line_color;
@@ -126,14 +126,14 @@ public:
 
     static std::span<const texture::Member<GridTexture>> members();
     static std::span<const record::Field<GridTexture>> fields();
-    static std::span<const texture::Parameter<GridTexture>> parameters();
+    static std::span<const kind::ParameterRow<GridTexture>> parameters();
 };
 
 // Woven threads. `tile` is written as both "tile_u" and "tile_v".
 class ClothTexture final : public TextureKind<ClothTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kCloth, .version = 2, .pluginType = "TexCloth",
-                                           .what = "cloth texture"};
+    static constexpr KindInfo kInfo{.kind = kCloth, .version = 2, .pluginType = "TexCloth",
+                                    .what = "cloth texture"};
 
     UVWPtr uvwgen;
     AColor gap_color{1.0f, 1.0f, 1.0f, 1.0f};
@@ -145,14 +145,14 @@ public:
 
     static std::span<const texture::Member<ClothTexture>> members();
     static std::span<const record::Field<ClothTexture>> fields();
-    static std::span<const texture::Parameter<ClothTexture>> parameters();
+    static std::span<const kind::ParameterRow<ClothTexture>> parameters();
 };
 
 // A write without its generator fails after the version word is already written.
 class BulgeTexture final : public TextureKind<BulgeTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kBulge, .version = 1, .pluginType = "TexBulge",
-                                           .what = "bulge texture", .versionBeforeCheck = true};
+    static constexpr KindInfo kInfo{.kind = kBulge, .version = 1, .pluginType = "TexBulge",
+                                    .what = "bulge texture", .versionBeforeCheck = true};
 
     UVWPtr uvwgen;
     float u_width = 0.1f;
@@ -160,13 +160,13 @@ public:
 
     static std::span<const texture::Member<BulgeTexture>> members();
     static std::span<const record::Field<BulgeTexture>> fields();
-    static std::span<const texture::Parameter<BulgeTexture>> parameters();
+    static std::span<const kind::ParameterRow<BulgeTexture>> parameters();
 };
 
 class RampTexture final : public TextureKind<RampTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kRamp, .version = 1, .pluginType = "TexRamp",
-                                           .what = "ramp texture"};
+    static constexpr KindInfo kInfo{.kind = kRamp, .version = 1, .pluginType = "TexRamp",
+                                    .what = "ramp texture"};
 
     UVWPtr uvwgen;
     TexturePtr colors;
@@ -183,7 +183,7 @@ public:
 
     static std::span<const texture::Member<RampTexture>> members();
     static std::span<const record::Field<RampTexture>> fields();
-    static std::span<const texture::Parameter<RampTexture>> parameters();
+    static std::span<const kind::ParameterRow<RampTexture>> parameters();
 };
 
 } // namespace OrvexKavorCore

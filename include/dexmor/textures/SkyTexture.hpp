@@ -55,7 +55,7 @@ boost::shared_ptr<SunLight> sharedDefaultSun();
 
 class SkyTexture final : public TextureKind<SkyTexture> {
 public:
-    static constexpr TextureKindInfo kInfo{.kind = kSky, .version = 3, .pluginType = "TexSky", .what = "sky texture"};
+    static constexpr KindInfo kInfo{.kind = kSky, .version = 3, .pluginType = "TexSky", .what = "sky texture"};
 
     LightPtr sun = sharedDefaultSun();
     AnimatedTransform transform; // the identity at time 0
@@ -90,7 +90,7 @@ public:
 
     static std::span<const texture::Member<SkyTexture>> members();
     static std::span<const record::Field<SkyTexture>> fields();
-    static std::span<const texture::Parameter<SkyTexture>> parameters();
+    static std::span<const kind::ParameterRow<SkyTexture>> parameters();
 };
 
 } // namespace OrvexKavorCore

@@ -30,6 +30,7 @@
 #include <dexmor/archive/Members.hpp>
 #include <dexmor/archive/QuickArchive.hpp>
 #include <dexmor/archive/Record.hpp>
+#include <dexmor/model/Kind.hpp>
 #include <dexmor/platform/KavorTypes.hpp>
 #include <dexmor/textures/BaseTexture.hpp>
 #include <dexmor/xml/AssetXmlWriter.hpp>
@@ -38,25 +39,13 @@
 #include <boost/shared_ptr.hpp>
 
 #include <cstdint>
+#include <optional>
 #include <span>
 #include <string>
 #include <type_traits>
 #include <vector>
 
 namespace OrvexKavorCore {
-
-// The fixed facts of a texture kind.
-struct TextureKindInfo {
-    std::int32_t kind;      // the kind id under which the factory creates it
-    std::uint16_t version;  // the record version written; readers accept 1 to it
-    const char* pluginType; // the renderer plugin ("TexChecker")
-    const char* what;       // the kind in failure reports ("checker texture")
-    // Whether the members stand before the plain fields in the record.
-    bool membersFirst = true;
-    // Whether the version word is written before the check of the mandatory
-    // members (a refused write then leaves the version word behind).
-    bool versionBeforeCheck = false;
-};
 
 namespace texture {
 
@@ -74,18 +63,9 @@ struct Member {
     void (*take)(Tex& t, std::vector<TexturePtr>& out);
 };
 
-template <class M>
-struct MemberTraits;
-template <class C, class P>
-struct MemberTraits<P C::*> {
-    using Class = C;
-    using Pointer = P;
-};
-
 template <auto M>
 constexpr auto member(const char* name, bool optional, record::Versions versions) {
-    using Tex = typename MemberTraits<decltype(M)>::Class;
-    using Pointer = typename MemberTraits<decltype(M)>::Pointer;
+    using Tex = kind::ClassOf<M>;
     return Member<Tex>{
         name,
         optional,
@@ -100,7 +80,7 @@ constexpr auto member(const char* name, bool optional, record::Versions versions
         [](const Tex& a, const Tex& b) { return membersEqual(a.*M, b.*M); },
         [](Tex& t) { t.*M = cloneMember(t.*M); },
         [](Tex& t, std::vector<TexturePtr>& out) {
-            if constexpr (std::is_same_v<Pointer, TexturePtr>) {
+            if constexpr (std::is_same_v<kind::TypeOf<M>, TexturePtr>) {
                 if (t.*M) out.push_back(std::move(t.*M));
             } else {
                 (void)t;
@@ -122,78 +102,19 @@ constexpr auto optional(const char* name, record::Versions versions = record::al
     return member<M>(name, true, versions);
 }
 
-// One parameter of the texture's asset. A parameter that refers to a member has
-// the member's child name; its child asset is written before the texture's asset.
-template <class Tex>
-struct Parameter {
-    const char* name;
-    const char* child; // nullptr for a plain value
-    bool (*isSet)(const Tex& t);
-    void (*writeChild)(AssetXmlWriter& writer, const Tex& t, const std::string& childUrl);
-    // `url` is the child url for a member, the texture's own url otherwise.
-    void (*write)(AssetXmlWriter& writer, const char* name, const Tex& t, const std::string& url);
-};
-
-// The encoding follows the field's type: "color", "acolor", "vector", "float",
-// "integer", "bool".
-inline void writeValue(AssetXmlWriter& w, const char* name, const Color& v) { w.writeColor(name, v); }
-inline void writeValue(AssetXmlWriter& w, const char* name, const AColor& v) { w.writeAColor(name, v); }
-inline void writeValue(AssetXmlWriter& w, const char* name, const Vector& v) { w.writeVector(name, v); }
-inline void writeValue(AssetXmlWriter& w, const char* name, float v) { w.writeFloat(name, v); }
-inline void writeValue(AssetXmlWriter& w, const char* name, std::int32_t v) { w.writeInteger(name, v); }
-inline void writeValue(AssetXmlWriter& w, const char* name, bool v) { w.writeBool(name, v); }
-template <class T>
-void writeValue(AssetXmlWriter&, const char*, const T&) = delete;
-
-// The parameter `name` showing the plain field M.
-template <auto M>
-constexpr auto value(const char* name) {
-    using Tex = typename MemberTraits<decltype(M)>::Class;
-    return Parameter<Tex>{name, nullptr, nullptr, nullptr,
-                          [](AssetXmlWriter& w, const char* n, const Tex& t, const std::string&) {
-                              writeValue(w, n, t.*M);
-                          }};
-}
-
-// The "plugin" parameter `name` referring to the member M, whose asset is written
-// under the child name `child`.
-template <auto M>
-constexpr auto reference(const char* name, const char* child) {
-    using Tex = typename MemberTraits<decltype(M)>::Class;
-    return Parameter<Tex>{
-        name,
-        child,
-        [](const Tex& t) { return static_cast<bool>(t.*M); },
-        [](AssetXmlWriter& w, const Tex& t, const std::string& childUrl) { (t.*M)->writeXml(w, childUrl); },
-        [](AssetXmlWriter& w, const char* n, const Tex& t, const std::string& childUrl) {
-            w.writePlugin(n, t.*M, childUrl);
-        },
-    };
-}
-
-// "unknown <what> version (a, b)"; returns false.
-bool refuseVersion(QuickArchive& ar, const char* what, VersionWord version);
-
-// Opens the texture's asset, its plugin and the parameter list / closes them.
-void beginAsset(AssetXmlWriter& writer, const std::string& url, const char* pluginType);
-void endAsset(AssetXmlWriter& writer);
-
 } // namespace texture
 
 // The shared implementation of a texture kind. `Derived` provides
-//   static constexpr TextureKindInfo kInfo;
+//   static constexpr KindInfo kInfo;
 //   static std::span<const texture::Member<Derived>> members();
 //   static std::span<const record::Field<Derived>> fields();
-//   static std::span<const texture::Parameter<Derived>> parameters();
+//   static std::span<const kind::ParameterRow<Derived>> parameters();
 // and declares its fields with their defaults as member initialisers. A kind that
 // holds textures calls releaseTextureMembers() from its destructor.
 template <class Derived>
-class TextureKind : public BaseTexture {
+class TextureKind : public kind::Basics<Derived, BaseTexture> {
 public:
-    std::int32_t kindId() const override { return Derived::kInfo.kind; }
-    std::string pluginType() const override { return Derived::kInfo.pluginType; }
-
-    void resetToDefaults() override { self() = Derived(); }
+    using Descent = BaseTexture::Descent;
 
     TexturePtr clone() const override {
         Descent descent;
@@ -228,10 +149,9 @@ public:
 
     // A refused version leaves the texture at its defaults.
     bool readFromArchive(QuickArchive& ar) override {
-        const auto version = ar.get<VersionWord>();
-        resetToDefaults();
-        if (!accepts(version)) return texture::refuseVersion(ar, Derived::kInfo.what, version);
-        const unsigned v = version.second();
+        const auto version = startRead(ar);
+        if (!version) return false;
+        const unsigned v = *version;
         if (Derived::kInfo.membersFirst)
             return readMembers(ar, v) && record::readFields(ar, self(), Derived::fields(), v);
         return record::readFields(ar, self(), Derived::fields(), v) && readMembers(ar, v);
@@ -240,13 +160,19 @@ public:
     void writeXml(AssetXmlWriter& writer, std::string url) override {
         Descent descent;
         if (!descent) return;
-        writeChildAssets(writer, url);
+        kind::writeChildAssets(writer, self(), url, Derived::parameters());
         writeOwnAsset(writer, url);
     }
 
 protected:
-    static bool accepts(VersionWord version) {
-        return version.first() == 0 && version.second() >= 1 && version.second() <= Derived::kInfo.version;
+    // Reads the version word and resets the texture to its defaults, then checks
+    // the word: the record version, or nullopt when it is refused (the texture
+    // then stays at its defaults).
+    std::optional<unsigned> startRead(QuickArchive& ar) {
+        const auto version = ar.get<VersionWord>();
+        this->resetToDefaults();
+        if (!ar.checkVersion(version, Derived::kInfo.version, Derived::kInfo.what)) return std::nullopt;
+        return version.second();
     }
 
     bool readMembers(QuickArchive& ar, unsigned version) {
@@ -261,17 +187,11 @@ protected:
         return true;
     }
 
-    // The assets of the set members, in the order of the parameters.
-    void writeChildAssets(AssetXmlWriter& writer, const std::string& url) const {
-        for (const auto& p : Derived::parameters())
-            if (p.child && p.isSet(self())) p.writeChild(writer, self(), url + "/" + p.child);
-    }
-
     // The texture's own asset with every parameter.
     void writeOwnAsset(AssetXmlWriter& writer, const std::string& url) const {
-        texture::beginAsset(writer, url, Derived::kInfo.pluginType);
-        for (const auto& p : Derived::parameters()) p.write(writer, p.name, self(), p.child ? url + "/" + p.child : url);
-        texture::endAsset(writer);
+        kind::beginAsset(writer, url, "texture", Derived::kInfo.pluginType);
+        kind::writeParameters(writer, self(), url, Derived::parameters());
+        kind::endAsset(writer);
     }
 
     void takeTextureMembers(std::vector<TexturePtr>& out) override {
