@@ -247,10 +247,9 @@ bool SceneMaterials::writeToArchive(QuickArchive& ar) {
 
 bool SceneMaterials::readFromArchive(QuickArchive& ar) {
     clear();
-    const auto version = ar.get<VersionWord>();
-    if (version.first() != 0 || version.second() < 1 || version.second() > 2)
-        return material::refuseVersion(ar, "material library", version);
-    const bool older = version.second() == 1;
+    const auto version = ar.readVersion(2, "material library");
+    if (!version) return false;
+    const bool older = version->second() == 1;
 
     const auto count = ar.get<std::uint32_t>();
     if (!ar.canHold(count, 8))

@@ -400,6 +400,18 @@ TEST_F(MaterialRecordsTest, Copies) {
     EXPECT_TRUE(toonCopy->name == "Toon" && toonCopy->baseMtl->name == "Base1");
     EXPECT_NE(toonCopy->opacityTex, toon->opacityTex);
 
+    // The wrappers' textures are copied with them.
+    auto bump = make<MaterialBump>("Bump");
+    bump->baseMtl = layered;
+    bump->bumpTex = boost::make_shared<AColorTexture>();
+    auto alpha = make<MaterialAlphaContribution>("Alpha");
+    alpha->alphaTex = boost::make_shared<AColorTexture>();
+    const auto bumpCopy = as<MaterialBump>(bump->cloneRenamed());
+    const auto alphaCopy = as<MaterialAlphaContribution>(alpha->clone());
+    EXPECT_TRUE(bumpCopy->bumpTex && bumpCopy->bumpTex != bump->bumpTex && bumpCopy->baseMtl->name == "Base1");
+    EXPECT_TRUE(alphaCopy->alphaTex && alphaCopy->alphaTex != alpha->alphaTex && !alphaCopy->baseMtl);
+    EXPECT_TRUE(bumpCopy->isEqual(bump) && alphaCopy->isEqual(alpha));
+
     auto reference = make<MaterialReference>("Base");
     reference->heldMaterial = layered;
     const auto refCopy = as<MaterialReference>(reference->cloneRenamed());
