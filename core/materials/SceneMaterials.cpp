@@ -257,13 +257,17 @@ bool SceneMaterials::readFromArchive(QuickArchive& ar) {
     for (std::uint32_t i = 0; i < count; ++i) {
         MaterialPtr material;
         if (!readMember(ar, material, nullptr, i)) return false;
+        // A name taken already fails the read in both versions: the later
+        // material would be lost, and its identifier would name the other one.
+        bool joined;
         if (older) {
-            if (!add(material))
-                return ar.fail("the material \"" + material->name + "\" cannot join the library: its name is taken");
+            joined = add(material);
         } else {
             std::unique_lock lock(mutex_);
-            byName_.emplace(material->name, material);
+            joined = byName_.emplace(material->name, material).second;
         }
+        if (!joined)
+            return ar.fail("the material \"" + material->name + "\" cannot join the library: its name is taken");
     }
     if (older) return true;
 
