@@ -11,7 +11,6 @@
 #include <cstring>
 #include <filesystem>
 #include <fstream>
-#include <regex>
 #include <sstream>
 #include <unistd.h>
 
@@ -235,11 +234,16 @@ TEST_F(FoldingTest, WholeFilesInAllThreeGenerations) {
 
 namespace {
 
-std::vector<std::string> allOf(const std::string& xml, const char* pattern) {
+// The values of `attribute` in every `tag` of the document, in order.
+std::vector<std::string> allOf(const std::string& xml, const std::string& tag, const std::string& attribute) {
     std::vector<std::string> found;
-    const std::regex re(pattern);
-    for (auto it = std::sregex_iterator(xml.begin(), xml.end(), re); it != std::sregex_iterator(); ++it)
-        found.push_back((*it)[1]);
+    const std::string key = " " + attribute + "=\"";
+    for (std::size_t at = xml.find(tag); at != std::string::npos; at = xml.find(tag, at + 1)) {
+        const std::size_t value = xml.find(key, at);
+        if (value == std::string::npos || value > xml.find('>', at)) continue;
+        const std::size_t begin = value + key.size();
+        found.push_back(xml.substr(begin, xml.find('"', begin) - begin));
+    }
     return found;
 }
 
@@ -249,9 +253,8 @@ std::pair<std::vector<std::string>, std::vector<std::string>> unfolded(BaseMater
     AssetXmlWriter writer(xml);
     m.writeXml(writer, "/Lib");
     const std::size_t last = xml.rfind("<Asset ");
-    return {allOf(xml, "<Asset [^>]*url=\"([^\"]*)\""),
-            last == std::string::npos ? std::vector<std::string>{}
-                                      : allOf(xml.substr(last), "<parameter type=\"[^\"]*\" name=\"([^\"]*)\"")};
+    return {allOf(xml, "<Asset ", "url"),
+            last == std::string::npos ? std::vector<std::string>{} : allOf(xml.substr(last), "<parameter ", "name")};
 }
 
 using Names = std::vector<std::string>;
