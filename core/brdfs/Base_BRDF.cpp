@@ -37,11 +37,8 @@ bool Base_BRDF::writeBaseRecord(QuickArchive& ar) {
 
 bool Base_BRDF::readBaseRecord(QuickArchive& ar) {
     resetBase();
-    const auto version = ar.get<VersionWord>();
-    if (version.first() != 0 || version.second() < 1 || version.second() > kBaseRecordVersion)
-        return ar.fail("unknown BRDF base record version (" + std::to_string(version.first()) + ", " +
-                       std::to_string(version.second()) + ")");
-    return record::readFields(ar, *this, kBaseFields, version.second());
+    const auto version = ar.readVersion(kBaseRecordVersion, "BRDF base record");
+    return version && record::readFields(ar, *this, kBaseFields, version->second());
 }
 
 bool Base_BRDF::writeToArchive(QuickArchive& ar) { return writeBaseRecord(ar); }

@@ -18,23 +18,23 @@ constexpr std::array kFields = {
     field<&B::transparencyTexMult>("transparencyTexMult"),
     brdf::pathItem<&B::colorTex>("colorTex path", between(1, 1)),
     brdf::pathItem<&B::transparencyTex>("transparencyTex path", between(1, 1)),
-    brdf::textureItem<&B::colorTex>("colorTex", since(2)),
-    brdf::textureItem<&B::transparencyTex>("transparencyTex", since(2)),
-    brdf::baseRecord<B>(since(3)),
+    field<&B::colorTex>("colorTex", since(2)),
+    field<&B::transparencyTex>("transparencyTex", since(2)),
+    kind::baseRecord<B>(since(3)),
 };
 
 constexpr std::array kParameters = {
-    brdf::value<&B::color>("color"),
-    brdf::value<&B::transparency>("transparency"),
-    brdf::value<&B::colorTexMult>("color_tex_mult"),
-    brdf::value<&B::transparencyTexMult>("transparency_tex_mult"),
-    brdf::texture<&B::colorTex>("color_tex", "color_texture"),
-    brdf::texture<&B::transparencyTex>("transparency_tex", "transparency_texture"),
+    kind::value<&B::color>("color"),
+    kind::value<&B::transparency>("transparency"),
+    kind::value<&B::colorTexMult>("color_tex_mult"),
+    kind::value<&B::transparencyTexMult>("transparency_tex_mult"),
+    kind::reference<&B::colorTex>("color_tex", "color_texture"),
+    kind::reference<&B::transparencyTex>("transparency_tex", "transparency_texture"),
 };
 
 } // namespace
 
 std::span<const record::Field<Diffuse_BRDF>> Diffuse_BRDF::fields() { return kFields; }
-std::span<const brdf::Parameter<Diffuse_BRDF>> Diffuse_BRDF::parameters() { return kParameters; }
+std::span<const kind::ParameterRow<Diffuse_BRDF>> Diffuse_BRDF::parameters() { return kParameters; }
 
 } // namespace OrvexKavorCore

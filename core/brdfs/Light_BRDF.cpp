@@ -20,26 +20,26 @@ constexpr std::array kFields = {
     field<&B::transparencyTexMult>("transparencyTexMult"),
     brdf::pathItem<&B::colorTex>("colorTex path", between(2, 2)),
     brdf::pathItem<&B::transparencyTex>("transparencyTex path", between(1, 2)),
-    brdf::textureItem<&B::colorTex>("colorTex", since(3)),
-    brdf::textureItem<&B::transparencyTex>("transparencyTex", since(3)),
-    brdf::baseRecord<B>(since(4)),
+    field<&B::colorTex>("colorTex", since(3)),
+    field<&B::transparencyTex>("transparencyTex", since(3)),
+    kind::baseRecord<B>(since(4)),
     field<&B::doubleSided>("doubleSided", since(5)),
 };
 
 constexpr std::array kParameters = {
-    brdf::value<&B::color>("color"),
-    brdf::value<&B::transparency>("transparency"),
-    brdf::value<&B::intensity>("intensity"),
-    brdf::value<&B::transparencyTexMult>("transparency_tex_mult"),
-    brdf::value<&B::colorTexMult>("color_tex_mult"),
-    brdf::flag<&B::doubleSided>("doubleSided"),
-    brdf::texture<&B::colorTex>("color_tex", "color_texture"),
-    brdf::texture<&B::transparencyTex>("transparency_tex", "transp_texture"),
+    kind::value<&B::color>("color"),
+    kind::value<&B::transparency>("transparency"),
+    kind::value<&B::intensity>("intensity"),
+    kind::value<&B::transparencyTexMult>("transparency_tex_mult"),
+    kind::value<&B::colorTexMult>("color_tex_mult"),
+    kind::flag<&B::doubleSided>("doubleSided"),
+    kind::reference<&B::colorTex>("color_tex", "color_texture"),
+    kind::reference<&B::transparencyTex>("transparency_tex", "transp_texture"),
 };
 
 } // namespace
 
 std::span<const record::Field<Light_BRDF>> Light_BRDF::fields() { return kFields; }
-std::span<const brdf::Parameter<Light_BRDF>> Light_BRDF::parameters() { return kParameters; }
+std::span<const kind::ParameterRow<Light_BRDF>> Light_BRDF::parameters() { return kParameters; }
 
 } // namespace OrvexKavorCore

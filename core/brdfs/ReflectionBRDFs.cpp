@@ -28,24 +28,24 @@ std::span<const record::Field<Mirror_BRDF>> Mirror_BRDF::fields() {
         brdf::pathItem<&B::transparencyTex>("transparencyTex path", between(1, 2)),
         field<&B::colorTexMult>("colorTexMult", since(2)),
         brdf::pathItem<&B::colorTex>("colorTex path", between(2, 2)),
-        brdf::textureItem<&B::transparencyTex>("transparencyTex", since(3)),
-        brdf::textureItem<&B::colorTex>("colorTex", since(3)),
-        brdf::baseRecord<B>(since(4)),
+        field<&B::transparencyTex>("transparencyTex", since(3)),
+        field<&B::colorTex>("colorTex", since(3)),
+        kind::baseRecord<B>(since(4)),
         brdf::fresnelConversion<&B::legacyFresnel_, &B::transparencyTex>(between(1, 4)),
     };
     return kFields;
 }
 
-std::span<const brdf::Parameter<Mirror_BRDF>> Mirror_BRDF::parameters() {
+std::span<const kind::ParameterRow<Mirror_BRDF>> Mirror_BRDF::parameters() {
     using B = Mirror_BRDF;
     static constexpr std::array kParameters = {
-        brdf::value<&B::color>("color"),
-        brdf::value<&B::transparency>("transparency"),
-        brdf::value<&B::colorTexMult>("color_tex_mult"),
-        brdf::value<&B::transparencyTexMult>("transparency_tex_mult"),
-        brdf::value<&B::cutoff>("cutoff"),
-        brdf::texture<&B::transparencyTex>("transparency_tex", "transparency_texture"),
-        brdf::texture<&B::colorTex>("color_tex", "color_texture"),
+        kind::value<&B::color>("color"),
+        kind::value<&B::transparency>("transparency"),
+        kind::value<&B::colorTexMult>("color_tex_mult"),
+        kind::value<&B::transparencyTexMult>("transparency_tex_mult"),
+        kind::value<&B::cutoff>("cutoff"),
+        kind::reference<&B::transparencyTex>("transparency_tex", "transparency_texture"),
+        kind::reference<&B::colorTex>("color_tex", "color_texture"),
     };
     return kParameters;
 }
@@ -74,39 +74,39 @@ std::span<const record::Field<GlossyReflection<Leaf>>> GlossyReflection<Leaf>::f
         brdf::pathItem<&B::colorTex>("colorTex path", between(2, 3)),
         brdf::pathItem<&B::hilightGlossinessTex>("hilightGlossinessTex path", between(2, 3)),
         brdf::pathItem<&B::reflectionGlossinessTex>("reflectionGlossinessTex path", between(2, 3)),
-        brdf::textureItem<&B::colorTex>("colorTex", since(4)),
-        brdf::textureItem<&B::hilightGlossinessTex>("hilightGlossinessTex", since(4)),
-        brdf::textureItem<&B::reflectionGlossinessTex>("reflectionGlossinessTex", since(4)),
-        brdf::textureItem<&B::transparencyTex>("transparencyTex", since(6)),
+        field<&B::colorTex>("colorTex", since(4)),
+        field<&B::hilightGlossinessTex>("hilightGlossinessTex", since(4)),
+        field<&B::reflectionGlossinessTex>("reflectionGlossinessTex", since(4)),
+        field<&B::transparencyTex>("transparencyTex", since(6)),
         field<&B::anisotropy>("anisotropy", since(3)),
         field<&B::anisotropyRotation>("anisotropyRotation", since(3)),
-        brdf::baseRecord<B>(since(5)),
+        kind::baseRecord<B>(since(5)),
         brdf::fresnelConversion<&B::legacyFresnel_, &B::transparencyTex>(between(1, 5)),
     };
     return kFields;
 }
 
 template <class Leaf>
-std::span<const brdf::Parameter<GlossyReflection<Leaf>>> GlossyReflection<Leaf>::parameters() {
+std::span<const kind::ParameterRow<GlossyReflection<Leaf>>> GlossyReflection<Leaf>::parameters() {
     using B = GlossyReflection<Leaf>;
     static constexpr std::array kParameters = {
-        brdf::value<&B::color>("color"),
-        brdf::value<&B::transparency>("transparency"),
-        brdf::value<&B::hilightGlossiness>("hilightGlossiness"),
-        brdf::value<&B::reflectionGlossiness>("reflectionGlossiness"),
-        brdf::value<&B::cutoff>("cutoff"),
-        brdf::value<&B::subdivs>("subdivs"),
-        brdf::value<&B::backSide>("back_side"),
-        brdf::value<&B::colorTexMult>("color_tex_mult"),
-        brdf::value<&B::hilightGlossinessTexMult>("hilightGlossiness_tex_mult"),
-        brdf::value<&B::reflectionGlossinessTexMult>("reflectionGlossiness_tex_mult"),
-        brdf::value<&B::transparencyTexMult>("transparency_tex_mult"),
-        brdf::value<&B::anisotropy>("anisotropy"),
-        brdf::value<&B::anisotropyRotation>("anisotropy_rotation"),
-        brdf::texture<&B::colorTex>("color_tex", "color_texture"),
-        brdf::texture<&B::hilightGlossinessTex>("hilightGlossiness_tex", "hilight_glossiness_texture"),
-        brdf::texture<&B::reflectionGlossinessTex>("reflectionGlossiness_tex", "reflection_glossiness_texture"),
-        brdf::texture<&B::transparencyTex>("transparency_tex", "transparency_texture"),
+        kind::value<&B::color>("color"),
+        kind::value<&B::transparency>("transparency"),
+        kind::value<&B::hilightGlossiness>("hilightGlossiness"),
+        kind::value<&B::reflectionGlossiness>("reflectionGlossiness"),
+        kind::value<&B::cutoff>("cutoff"),
+        kind::value<&B::subdivs>("subdivs"),
+        kind::value<&B::backSide>("back_side"),
+        kind::value<&B::colorTexMult>("color_tex_mult"),
+        kind::value<&B::hilightGlossinessTexMult>("hilightGlossiness_tex_mult"),
+        kind::value<&B::reflectionGlossinessTexMult>("reflectionGlossiness_tex_mult"),
+        kind::value<&B::transparencyTexMult>("transparency_tex_mult"),
+        kind::value<&B::anisotropy>("anisotropy"),
+        kind::value<&B::anisotropyRotation>("anisotropy_rotation"),
+        kind::reference<&B::colorTex>("color_tex", "color_texture"),
+        kind::reference<&B::hilightGlossinessTex>("hilightGlossiness_tex", "hilight_glossiness_texture"),
+        kind::reference<&B::reflectionGlossinessTex>("reflectionGlossiness_tex", "reflection_glossiness_texture"),
+        kind::reference<&B::transparencyTex>("transparency_tex", "transparency_texture"),
     };
     return kParameters;
 }

@@ -80,12 +80,9 @@ bool BaseMaterial::writeBaseRecord(QuickArchive& ar) const {
 }
 
 bool BaseMaterial::readBaseRecord(QuickArchive& ar) {
-    const auto version = ar.get<VersionWord>();
-    if (version.first() != 0 || version.second() < 1 || version.second() > 2)
-        return ar.fail("unknown base material record version (" + std::to_string(version.first()) + ", " +
-                       std::to_string(version.second()) + ")");
-    if (!ar.readWString(name)) return false;
-    if (version.second() == 2 && !ar.readWString(identifier)) return false;
+    const auto version = ar.readVersion(2, "base material record");
+    if (!version || !ar.readWString(name)) return false;
+    if (version->second() == 2 && !ar.readWString(identifier)) return false;
     if (name.empty()) name = defaultMaterialName();
     return true;
 }

@@ -1,7 +1,5 @@
 #include <dexmor/materials/CompositeMaterials.hpp>
 
-#include <dexmor/xml/AssetXmlWriter.hpp>
-
 #include <algorithm>
 #include <array>
 
@@ -9,49 +7,73 @@ namespace OrvexKavorCore {
 
 namespace {
 
-using material::baseRecord;
-using material::writeAssetOf;
+using kind::baseRecord;
+using kind::reference;
+using kind::value;
 using material::nameItem;
-using material::Optional;
+using material::subMaterial;
 using record::between;
 using record::field;
-using record::fieldAs;
 using record::since;
 
 constexpr std::array kMultiFields = {
-    fieldAs<material::List<MaterialPtr>, &MaterialMulti::subMaterials>("subMaterials"),
+    field<&MaterialMulti::subMaterials>("subMaterials"),
     nameItem<MaterialMulti>(between(1, 1)),
     baseRecord<MaterialMulti>(since(2)),
 };
 
 constexpr std::array k2SidedFields = {
-    fieldAs<Optional<MaterialPtr>, &Material2Sided::front>("front"),
-    fieldAs<Optional<MaterialPtr>, &Material2Sided::back>("back"),
-    fieldAs<Optional<TexturePtr>, &Material2Sided::translucencyTex>("translucencyTex"),
+    field<&Material2Sided::front>("front"),
+    field<&Material2Sided::back>("back"),
+    field<&Material2Sided::translucencyTex>("translucencyTex"),
     field<&Material2Sided::translucency>("translucency"),
     field<&Material2Sided::translucencyTexMult>("translucencyTexMult"),
     field<&Material2Sided::force1Sided>("force1Sided"),
-    fieldAs<Optional<TexturePtr>, &Material2Sided::transparencyTex>("transparencyTex", since(2)),
+    field<&Material2Sided::transparencyTex>("transparencyTex", since(2)),
     field<&Material2Sided::transparency>("transparency", since(2)),
     field<&Material2Sided::transparencyTexMult>("transparencyTexMult", since(2)),
     baseRecord<Material2Sided>(since(3)),
 };
 
+constexpr std::array k2SidedParameters = {
+    subMaterial<&Material2Sided::front>("front"),
+    subMaterial<&Material2Sided::back>("back"),
+    reference<&Material2Sided::translucencyTex>("translucency_tex", "translucency_tex"),
+    reference<&Material2Sided::transparencyTex>("transparency_tex", "transparency_tex"),
+    value<&Material2Sided::translucency>("translucency"),
+    value<&Material2Sided::transparency>("transparency"),
+    value<&Material2Sided::translucencyTexMult>("translucency_tex_mult"),
+    value<&Material2Sided::transparencyTexMult>("transparency_tex_mult"),
+    value<&Material2Sided::force1Sided>("force_1sided"),
+};
+
 constexpr std::array kSkp2SidedFields = {
     baseRecord<MaterialSkp2Sided>(),
-    fieldAs<Optional<MaterialPtr>, &MaterialSkp2Sided::front>("front"),
-    fieldAs<Optional<MaterialPtr>, &MaterialSkp2Sided::back>("back"),
+    field<&MaterialSkp2Sided::front>("front"),
+    field<&MaterialSkp2Sided::back>("back"),
     field<&MaterialSkp2Sided::force1Sided>("force1Sided"),
+};
+
+constexpr std::array kSkp2SidedParameters = {
+    subMaterial<&MaterialSkp2Sided::front>("front"),
+    subMaterial<&MaterialSkp2Sided::back>("back"),
+    value<&MaterialSkp2Sided::force1Sided>("force_1sided"),
 };
 
 constexpr std::array kAngleBlendFields = {
     baseRecord<MaterialAngleBlend>(),
-    fieldAs<Optional<MaterialPtr>, &MaterialAngleBlend::mtlOne>("mtlOne"),
-    fieldAs<Optional<MaterialPtr>, &MaterialAngleBlend::mtlTwo>("mtlTwo"),
+    field<&MaterialAngleBlend::mtlOne>("mtlOne"),
+    field<&MaterialAngleBlend::mtlTwo>("mtlTwo"),
     field<&MaterialAngleBlend::startAngle>("startAngle"),
     field<&MaterialAngleBlend::stopAngle>("stopAngle"),
 };
 
+constexpr std::array kAngleBlendParameters = {
+    subMaterial<&MaterialAngleBlend::mtlOne>("mtl_one"),
+    subMaterial<&MaterialAngleBlend::mtlTwo>("mtl_two"),
+    value<&MaterialAngleBlend::startAngle>("start_angle"),
+    value<&MaterialAngleBlend::stopAngle>("stop_angle"),
+};
 
 } // namespace
 
@@ -71,6 +93,7 @@ void MaterialMulti::takeMaterialMembers(std::vector<MaterialPtr>& out) {
 // --- Material2Sided ---
 
 std::span<const record::Field<Material2Sided>> Material2Sided::fields() { return k2SidedFields; }
+std::span<const kind::ParameterRow<Material2Sided>> Material2Sided::parameters() { return k2SidedParameters; }
 
 bool Material2Sided::separate(bool renamed) {
     return material::copyMember(front, renamed) && material::copyMember(back, renamed);
@@ -81,31 +104,12 @@ void Material2Sided::takeMaterialMembers(std::vector<MaterialPtr>& out) {
     material::take(back, out);
 }
 
-void Material2Sided::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
-    MaterialWalk walk(MaterialWalk::kXml, this);
-    if (!walk) return;
-    const std::string url = urlPrefix + "/" + name;
-    const std::string translucencyUrl = url + "/translucency_tex", transparencyUrl = url + "/transparency_tex";
-    writeAssetOf(writer, front, url);
-    writeAssetOf(writer, back, url);
-    writeAssetOf(writer, translucencyTex, translucencyUrl);
-    writeAssetOf(writer, transparencyTex, transparencyUrl);
-    material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writePluginByName("front", url, nameOf(front));
-    writer.writePluginByName("back", url, nameOf(back));
-    writer.writePlugin("translucency_tex", translucencyTex, translucencyUrl);
-    writer.writePlugin("transparency_tex", transparencyTex, transparencyUrl);
-    writer.writeColor("translucency", translucency);
-    writer.writeColor("transparency", transparency);
-    writer.writeFloat("translucency_tex_mult", translucencyTexMult);
-    writer.writeFloat("transparency_tex_mult", transparencyTexMult);
-    writer.writeBool("force_1sided", force1Sided);
-    material::endAsset(writer);
-}
-
 // --- MaterialSkp2Sided ---
 
 std::span<const record::Field<MaterialSkp2Sided>> MaterialSkp2Sided::fields() { return kSkp2SidedFields; }
+std::span<const kind::ParameterRow<MaterialSkp2Sided>> MaterialSkp2Sided::parameters() {
+    return kSkp2SidedParameters;
+}
 
 bool MaterialSkp2Sided::separate(bool renamed) {
     return material::copyMember(front, renamed) && material::copyMember(back, renamed);
@@ -116,22 +120,12 @@ void MaterialSkp2Sided::takeMaterialMembers(std::vector<MaterialPtr>& out) {
     material::take(back, out);
 }
 
-void MaterialSkp2Sided::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
-    MaterialWalk walk(MaterialWalk::kXml, this);
-    if (!walk) return;
-    const std::string url = urlPrefix + "/" + name;
-    writeAssetOf(writer, front, url);
-    writeAssetOf(writer, back, url);
-    material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writePluginByName("front", url, nameOf(front));
-    writer.writePluginByName("back", url, nameOf(back));
-    writer.writeBool("force_1sided", force1Sided);
-    material::endAsset(writer);
-}
-
 // --- MaterialAngleBlend ---
 
 std::span<const record::Field<MaterialAngleBlend>> MaterialAngleBlend::fields() { return kAngleBlendFields; }
+std::span<const kind::ParameterRow<MaterialAngleBlend>> MaterialAngleBlend::parameters() {
+    return kAngleBlendParameters;
+}
 
 bool MaterialAngleBlend::separate(bool renamed) {
     return material::copyMember(mtlOne, renamed) && material::copyMember(mtlTwo, renamed);
@@ -140,20 +134,6 @@ bool MaterialAngleBlend::separate(bool renamed) {
 void MaterialAngleBlend::takeMaterialMembers(std::vector<MaterialPtr>& out) {
     material::take(mtlOne, out);
     material::take(mtlTwo, out);
-}
-
-void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
-    MaterialWalk walk(MaterialWalk::kXml, this);
-    if (!walk) return;
-    const std::string url = urlPrefix + "/" + name;
-    writeAssetOf(writer, mtlOne, url);
-    writeAssetOf(writer, mtlTwo, url);
-    material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writePluginByName("mtl_one", url, nameOf(mtlOne));
-    writer.writePluginByName("mtl_two", url, nameOf(mtlTwo));
-    writer.writeFloat("start_angle", startAngle);
-    writer.writeFloat("stop_angle", stopAngle);
-    material::endAsset(writer);
 }
 
 } // namespace OrvexKavorCore

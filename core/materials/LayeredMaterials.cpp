@@ -9,15 +9,14 @@ namespace OrvexKavorCore {
 
 namespace {
 
-using material::baseRecord;
+using kind::baseRecord;
 using material::nameItem;
 using record::between;
 using record::field;
-using record::fieldAs;
 using record::since;
 
 constexpr std::array kLayeredFields = {
-    fieldAs<material::List<BRDFPtr>, &MaterialLayeredBRDF::layers>("layers"),
+    field<&MaterialLayeredBRDF::layers>("layers"),
     field<&MaterialLayeredBRDF::doubleSided>("doubleSided"),
     field<&MaterialLayeredBRDF::option1>("option1"),
     field<&MaterialLayeredBRDF::option2>("option2", since(3)),
@@ -31,7 +30,7 @@ constexpr std::array kSingleFields = {
     field<&MaterialSingleBRDF::option1>("option1"),
     field<&MaterialSingleBRDF::option2>("option2"),
     nameItem<MaterialSingleBRDF>(between(1, 1)),
-    fieldAs<material::Required<BRDFPtr>, &MaterialSingleBRDF::brdf>("brdf"),
+    record::fieldAs<material::Required<BRDFPtr>, &MaterialSingleBRDF::brdf>("brdf"),
     baseRecord<MaterialSingleBRDF>(since(2)),
 };
 
@@ -56,9 +55,9 @@ void MaterialLayeredBRDF::writeXml(AssetXmlWriter& writer, std::string urlPrefix
     if (!walk) return;
     const std::string url = urlPrefix + "/" + name;
     writeLayerAssets(writer, url);
-    material::beginAsset(writer, url, kLayout, kInfo.pluginType);
+    kind::beginAsset(writer, url, "material", kInfo.pluginType, kLayout);
     writeLayerParameters(writer, url);
-    material::endAsset(writer);
+    kind::endAsset(writer);
 }
 
 void MaterialLayeredBRDF::writeLayerAssets(AssetXmlWriter& writer, const std::string& url) const {

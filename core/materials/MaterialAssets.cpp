@@ -8,6 +8,7 @@
 #include <dexmor/materials/WrapperMaterials.hpp>
 #include <dexmor/xml/AssetXmlWriter.hpp>
 
+#include <array>
 #include <initializer_list>
 
 namespace OrvexKavorCore {
@@ -57,69 +58,142 @@ boost::shared_ptr<Kind> firstOf(const MaterialPtr& material) {
     return found.empty() ? boost::shared_ptr<Kind>() : boost::dynamic_pointer_cast<Kind>(found.front());
 }
 
+using kind::flag;
+using kind::reference;
+using kind::value;
+
 // A sub-material parameter: "/" + its name, written only for a referenceable one.
-void writeMaterialReference(AssetXmlWriter& writer, const char* name, const MaterialPtr& material) {
-    if (isReferenceable(material)) writer.writePluginByName(name, {}, nameOf(material));
+template <auto M>
+constexpr kind::ParameterRow<kind::ClassOf<M>> referenceByName(const char* name) {
+    using Obj = kind::ClassOf<M>;
+    return {name, nullptr, nullptr, nullptr, [](AssetXmlWriter& w, const char* n, const Obj& o, const std::string&) {
+                if (isReferenceable(o.*M)) w.writePluginByName(n, {}, nameOf(o.*M));
+            }};
 }
 
-void writeAngleBlendAsset(AssetXmlWriter& writer, const MaterialAngleBlend& blend) {
-    material::beginAsset(writer, "/" + blend.name, "AngleBlendMatLayout", blend.pluginType());
-    writeMaterialReference(writer, "mtl_one", blend.mtlOne);
-    writeMaterialReference(writer, "mtl_two", blend.mtlTwo);
-    writer.writeFloat("start_angle", blend.startAngle);
-    writer.writeFloat("stop_angle", blend.stopAngle);
-    material::endAsset(writer);
+// The "bool" parameter `name`, true: the folded wrapper is there.
+template <class Obj>
+constexpr kind::ParameterRow<Obj> switchedOn(const char* name) {
+    return {name, nullptr, nullptr, nullptr,
+            [](AssetXmlWriter& w, const char* n, const Obj&, const std::string&) { w.writeBool(n, true); }};
 }
 
-void write2SidedAsset(AssetXmlWriter& writer, const Material2Sided& twoSided) {
-    material::beginAsset(writer, "/" + twoSided.name, "TwoSidedMatLayout", twoSided.pluginType());
-    writeMaterialReference(writer, "front", twoSided.front);
-    writeMaterialReference(writer, "back", twoSided.back);
-    writer.writeColor("translucency", twoSided.translucency);
-    writer.writeBool("force_1sided", twoSided.force1Sided);
-    material::endAsset(writer);
+// --- the parameters each wrapper adds to the folded asset ---
+
+constexpr std::array kBumpFolded = {
+    switchedOn<MaterialBump>("bump_on"),
+    value<&MaterialBump::bumpTexMult>("bump_tex_mult"),
+    reference<&MaterialBump::bumpTex>("bump_tex", "bump_tex"),
+};
+
+constexpr std::array kDisplacedFolded = {
+    switchedOn<MaterialDisplaced>("displace_on"),
+    value<&MaterialDisplaced::displaceShift>("displace_shift"),
+    value<&MaterialDisplaced::displaceEdgeLength>("displace_edge_length"),
+    value<&MaterialDisplaced::displaceTexMult>("displace_tex_mult"),
+    value<&MaterialDisplaced::displaceMaxSubdivs>("displace_max_subdivs"),
+    value<&MaterialDisplaced::displaceContinuity>("displace_continuity"),
+    value<&MaterialDisplaced::displaceViewDependent>("displace_view_dependent"),
+    value<&MaterialDisplaced::displaceUseGlobals>("displace_use_globals"),
+    reference<&MaterialDisplaced::displaceTex>("displace_tex", "displace_tex"),
+};
+
+constexpr std::array kEnvironmentFolded = {
+    reference<&MaterialOverrideEnvironment::giTex>("gi_tex", "gi_tex"),
+    reference<&MaterialOverrideEnvironment::bgTex>("bg_tex", "bg_tex"),
+    reference<&MaterialOverrideEnvironment::reflectTex>("reflect_tex", "reflect_tex"),
+    reference<&MaterialOverrideEnvironment::refractTex>("refract_tex", "refract_tex"),
+    value<&MaterialOverrideEnvironment::giColor>("gi_color"),
+    value<&MaterialOverrideEnvironment::bgColor>("bg_color"),
+    value<&MaterialOverrideEnvironment::reflectColor>("reflect_color"),
+    value<&MaterialOverrideEnvironment::refractColor>("refract_color"),
+    value<&MaterialOverrideEnvironment::bgTexMult>("bg_tex_mult"),
+    value<&MaterialOverrideEnvironment::giTexMult>("gi_tex_mult"),
+    value<&MaterialOverrideEnvironment::reflectTexMult>("reflect_tex_mult"),
+    value<&MaterialOverrideEnvironment::refractTexMult>("refract_tex_mult"),
+    value<&MaterialOverrideEnvironment::overrideBg>("override_bg"),
+    value<&MaterialOverrideEnvironment::overrideGi>("override_gi"),
+    value<&MaterialOverrideEnvironment::overrideReflect>("override_reflect"),
+    value<&MaterialOverrideEnvironment::overrideRefract>("override_refract"),
+};
+
+constexpr std::array kExclusionFolded = {
+    flag<&MaterialObjectExclusion::mode>("ignore_objects"),
+    value<&MaterialObjectExclusion::shortCircuit>("short_circuit"),
+};
+
+constexpr std::array kAlphaFolded = {
+    value<&MaterialAlphaContribution::alpha>("alpha"),
+    value<&MaterialAlphaContribution::alphaTexMult>("alpha_tex_mult"),
+    reference<&MaterialAlphaContribution::alphaTex>("alpha_tex", "alpha_tex"),
+};
+
+// --- the own assets of the kinds that keep one ---
+
+constexpr std::array kAngleBlendAsset = {
+    referenceByName<&MaterialAngleBlend::mtlOne>("mtl_one"),
+    referenceByName<&MaterialAngleBlend::mtlTwo>("mtl_two"),
+    value<&MaterialAngleBlend::startAngle>("start_angle"),
+    value<&MaterialAngleBlend::stopAngle>("stop_angle"),
+};
+
+constexpr std::array k2SidedAsset = {
+    referenceByName<&Material2Sided::front>("front"),
+    referenceByName<&Material2Sided::back>("back"),
+    value<&Material2Sided::translucency>("translucency"),
+    value<&Material2Sided::force1Sided>("force_1sided"),
+};
+
+constexpr std::array kSkp2SidedAsset = {
+    referenceByName<&MaterialSkp2Sided::front>("front"),
+    referenceByName<&MaterialSkp2Sided::back>("back"),
+    value<&MaterialSkp2Sided::force1Sided>("force_1sided"),
+};
+
+constexpr std::array kToonAsset = {
+    referenceByName<&MaterialToon::baseMtl>("base_mtl"),
+    reference<&MaterialToon::lineColorTex>("lineColorTex", "color_tex"),
+    reference<&MaterialToon::distortTex>("distortTex", "distort_tex"),
+    reference<&MaterialToon::opacityTex>("opacityTex", "opacity_tex"),
+    reference<&MaterialToon::lineWidthTex>("lineWidthTex", "width_tex"),
+    value<&MaterialToon::lineColor>("lineColor"),
+    value<&MaterialToon::lineColorTexMult>("lineColorTexMult"),
+    value<&MaterialToon::distort>("distort"),
+    value<&MaterialToon::distortTexMult>("distortTexMult"),
+    value<&MaterialToon::opacity>("opacity"),
+    value<&MaterialToon::opacityTexMult>("opacityTexMult"),
+    value<&MaterialToon::lineWidth>("lineWidth"),
+    value<&MaterialToon::lineWidthTexMult>("lineWidthTexMult"),
+    value<&MaterialToon::zThreshold>("zThreshold"),
+    value<&MaterialToon::traceBias>("traceBias"),
+    value<&MaterialToon::normalThreshold>("normalThreshold"),
+    value<&MaterialToon::silhouetteMult>("silhouetteMult"),
+    value<&MaterialToon::doSecondary>("doSecondary"),
+    value<&MaterialToon::divideByDist>("divideByDist"),
+    value<&MaterialToon::doSilhouetteMult>("doSilhouetteMult"),
+};
+
+// The assets of the textures the rows refer to, then the material's own asset
+// under "/" + its name, with `layout`.
+template <class Kind, class Rows>
+void writeOwnAsset(AssetXmlWriter& writer, const Kind& m, const char* layout, const Rows& rows) {
+    const std::string url = "/" + m.name;
+    kind::writeChildAssets(writer, m, url, rows);
+    kind::beginAsset(writer, url, "material", m.pluginType(), layout);
+    kind::writeParameters(writer, m, url, rows);
+    kind::endAsset(writer);
 }
 
-void writeSkp2SidedAsset(AssetXmlWriter& writer, const MaterialSkp2Sided& host) {
-    material::beginAsset(writer, "/" + host.name, "SkpTwoSidedMatLayout", host.pluginType());
-    writeMaterialReference(writer, "front", host.front);
-    writeMaterialReference(writer, "back", host.back);
-    writer.writeBool("force_1sided", host.force1Sided);
-    material::endAsset(writer);
+// A folded wrapper's texture assets / parameters, when the wrapper is there.
+template <class Kind, class Rows>
+void writeFoldedChildren(AssetXmlWriter& writer, const boost::shared_ptr<Kind>& m, const std::string& url,
+                         const Rows& rows) {
+    if (m) kind::writeChildAssets(writer, *m, url, rows);
 }
-
-// The toon's textures, then its own asset.
-void writeToonAssets(AssetXmlWriter& writer, const MaterialToon& toon) {
-    const std::string url = "/" + toon.name;
-    const std::string colorUrl = url + "/color_tex", distortUrl = url + "/distort_tex",
-                      opacityUrl = url + "/opacity_tex", widthUrl = url + "/width_tex";
-    material::writeAssetOf(writer, toon.lineColorTex, colorUrl);
-    material::writeAssetOf(writer, toon.distortTex, distortUrl);
-    material::writeAssetOf(writer, toon.opacityTex, opacityUrl);
-    material::writeAssetOf(writer, toon.lineWidthTex, widthUrl);
-
-    material::beginAsset(writer, url, "ToonMatLayout", toon.pluginType());
-    writeMaterialReference(writer, "base_mtl", toon.baseMtl);
-    writer.writePlugin("lineColorTex", toon.lineColorTex, colorUrl);
-    writer.writePlugin("distortTex", toon.distortTex, distortUrl);
-    writer.writePlugin("opacityTex", toon.opacityTex, opacityUrl);
-    writer.writePlugin("lineWidthTex", toon.lineWidthTex, widthUrl);
-    writer.writeColor("lineColor", toon.lineColor);
-    writer.writeFloat("lineColorTexMult", toon.lineColorTexMult);
-    writer.writeFloat("distort", toon.distort);
-    writer.writeFloat("distortTexMult", toon.distortTexMult);
-    writer.writeFloat("opacity", toon.opacity);
-    writer.writeFloat("opacityTexMult", toon.opacityTexMult);
-    writer.writeFloat("lineWidth", toon.lineWidth);
-    writer.writeFloat("lineWidthTexMult", toon.lineWidthTexMult);
-    writer.writeFloat("zThreshold", toon.zThreshold);
-    writer.writeFloat("traceBias", toon.traceBias);
-    writer.writeFloat("normalThreshold", toon.normalThreshold);
-    writer.writeFloat("silhouetteMult", toon.silhouetteMult);
-    writer.writeBool("doSecondary", toon.doSecondary);
-    writer.writeBool("divideByDist", toon.divideByDist);
-    writer.writeBool("doSilhouetteMult", toon.doSilhouetteMult);
-    material::endAsset(writer);
+template <class Kind, class Rows>
+void writeFoldedParameters(AssetXmlWriter& writer, const boost::shared_ptr<Kind>& m, const std::string& url,
+                           const Rows& rows) {
+    if (m) kind::writeParameters(writer, *m, url, rows);
 }
 
 } // namespace
@@ -148,68 +222,21 @@ void writeFoldedAsset(AssetXmlWriter& writer, const MaterialPtr& material) {
     const auto alpha = firstOf<MaterialAlphaContribution>(material);
 
     const std::string url = "/" + material->name;
-    const std::string bumpUrl = url + "/bump_tex", displaceUrl = url + "/displace_tex", giUrl = url + "/gi_tex",
-                      bgUrl = url + "/bg_tex", reflectUrl = url + "/reflect_tex", refractUrl = url + "/refract_tex",
-                      alphaUrl = url + "/alpha_tex";
-
     // The textures' assets, the layers' assets, then the folded asset.
-    if (bump) material::writeAssetOf(writer, bump->bumpTex, bumpUrl);
-    if (displaced) material::writeAssetOf(writer, displaced->displaceTex, displaceUrl);
-    if (environment) {
-        material::writeAssetOf(writer, environment->giTex, giUrl);
-        material::writeAssetOf(writer, environment->bgTex, bgUrl);
-        material::writeAssetOf(writer, environment->reflectTex, reflectUrl);
-        material::writeAssetOf(writer, environment->refractTex, refractUrl);
-    }
-    if (alpha) material::writeAssetOf(writer, alpha->alphaTex, alphaUrl);
+    writeFoldedChildren(writer, bump, url, kBumpFolded);
+    writeFoldedChildren(writer, displaced, url, kDisplacedFolded);
+    writeFoldedChildren(writer, environment, url, kEnvironmentFolded);
+    writeFoldedChildren(writer, alpha, url, kAlphaFolded);
     layered->writeLayerAssets(writer, url);
 
-    material::beginAsset(writer, url, MaterialLayeredBRDF::kLayout, layered->pluginType());
+    kind::beginAsset(writer, url, "material", layered->pluginType(), MaterialLayeredBRDF::kLayout);
     layered->writeLayerParameters(writer, url);
-    if (bump) {
-        writer.writeBool("bump_on", true);
-        writer.writeFloat("bump_tex_mult", bump->bumpTexMult);
-        writer.writePlugin("bump_tex", bump->bumpTex, bumpUrl);
-    }
-    if (displaced) {
-        writer.writeBool("displace_on", true);
-        writer.writeFloat("displace_shift", displaced->displaceShift);
-        writer.writeFloat("displace_edge_length", displaced->displaceEdgeLength);
-        writer.writeFloat("displace_tex_mult", displaced->displaceTexMult);
-        writer.writeInteger("displace_max_subdivs", displaced->displaceMaxSubdivs);
-        writer.writeInteger("displace_continuity", displaced->displaceContinuity);
-        writer.writeInteger("displace_view_dependent", displaced->displaceViewDependent);
-        writer.writeInteger("displace_use_globals", displaced->displaceUseGlobals);
-        writer.writePlugin("displace_tex", displaced->displaceTex, displaceUrl);
-    }
-    if (environment) {
-        writer.writePlugin("gi_tex", environment->giTex, giUrl);
-        writer.writePlugin("bg_tex", environment->bgTex, bgUrl);
-        writer.writePlugin("reflect_tex", environment->reflectTex, reflectUrl);
-        writer.writePlugin("refract_tex", environment->refractTex, refractUrl);
-        writer.writeColor("gi_color", environment->giColor);
-        writer.writeColor("bg_color", environment->bgColor);
-        writer.writeColor("reflect_color", environment->reflectColor);
-        writer.writeColor("refract_color", environment->refractColor);
-        writer.writeFloat("bg_tex_mult", environment->bgTexMult);
-        writer.writeFloat("gi_tex_mult", environment->giTexMult);
-        writer.writeFloat("reflect_tex_mult", environment->reflectTexMult);
-        writer.writeFloat("refract_tex_mult", environment->refractTexMult);
-        writer.writeBool("override_bg", environment->overrideBg);
-        writer.writeBool("override_gi", environment->overrideGi);
-        writer.writeBool("override_reflect", environment->overrideReflect);
-        writer.writeBool("override_refract", environment->overrideRefract);
-    }
-    if (exclusion) {
-        writer.writeBool("ignore_objects", exclusion->mode != 0);
-        writer.writeBool("short_circuit", exclusion->shortCircuit);
-    }
-    if (alpha) {
-        writer.writeFloat("alpha", alpha->alpha);
-        writer.writeFloat("alpha_tex_mult", alpha->alphaTexMult);
-        writer.writePlugin("alpha_tex", alpha->alphaTex, alphaUrl);
-    }
-    material::endAsset(writer);
+    writeFoldedParameters(writer, bump, url, kBumpFolded);
+    writeFoldedParameters(writer, displaced, url, kDisplacedFolded);
+    writeFoldedParameters(writer, environment, url, kEnvironmentFolded);
+    writeFoldedParameters(writer, exclusion, url, kExclusionFolded);
+    writeFoldedParameters(writer, alpha, url, kAlphaFolded);
+    kind::endAsset(writer);
 }
 
 void writeMaterialAssets(AssetXmlWriter& writer, const MaterialPtr& material) {
@@ -217,18 +244,18 @@ void writeMaterialAssets(AssetXmlWriter& writer, const MaterialPtr& material) {
     if (const auto* blend = dynamic_cast<const MaterialAngleBlend*>(material.get())) {
         writeFoldedAsset(writer, blend->mtlOne);
         writeFoldedAsset(writer, blend->mtlTwo);
-        writeAngleBlendAsset(writer, *blend);
+        writeOwnAsset(writer, *blend, "AngleBlendMatLayout", kAngleBlendAsset);
     } else if (const auto* twoSided = dynamic_cast<const Material2Sided*>(material.get())) {
         writeFoldedAsset(writer, twoSided->front);
         writeFoldedAsset(writer, twoSided->back);
-        write2SidedAsset(writer, *twoSided);
+        writeOwnAsset(writer, *twoSided, "TwoSidedMatLayout", k2SidedAsset);
     } else if (const auto* host = dynamic_cast<const MaterialSkp2Sided*>(material.get())) {
         writeFoldedAsset(writer, host->front);
         writeFoldedAsset(writer, host->back);
-        writeSkp2SidedAsset(writer, *host);
+        writeOwnAsset(writer, *host, "SkpTwoSidedMatLayout", kSkp2SidedAsset);
     } else if (const auto* toon = dynamic_cast<const MaterialToon*>(material.get())) {
         writeFoldedAsset(writer, toon->baseMtl);
-        writeToonAssets(writer, *toon);
+        writeOwnAsset(writer, *toon, "ToonMatLayout", kToonAsset);
     } else {
         writeFoldedAsset(writer, material);
     }

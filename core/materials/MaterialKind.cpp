@@ -1,7 +1,6 @@
 #include <dexmor/materials/MaterialKind.hpp>
 
 #include <dexmor/materials/SceneMaterials.hpp>
-#include <dexmor/xml/AssetXmlWriter.hpp>
 
 namespace OrvexKavorCore::material {
 
@@ -24,11 +23,6 @@ bool TextList::write(QuickArchive& ar, const std::vector<std::string>& list) {
     return true;
 }
 
-bool refuseVersion(QuickArchive& ar, const char* what, VersionWord version) {
-    return ar.fail("unknown " + std::string(what) + " version (" + std::to_string(version.first()) + ", " +
-                   std::to_string(version.second()) + ")");
-}
-
 bool copyMember(MaterialPtr& m, bool renamed) {
     if (!m) return true;
     m = renamed ? m->cloneRenamed() : m->clone();
@@ -48,17 +42,5 @@ bool copyMember(BRDFPtr& b) {
 }
 
 std::string uniqueName(const std::string& source) { return SceneMaterials::instance()->uniqueName(source); }
-
-void beginAsset(AssetXmlWriter& writer, std::string_view url, std::string_view layout, std::string_view pluginType) {
-    writer.beginAsset(url, "material", layout);
-    writer.beginPlugin(pluginType, "material");
-    writer.beginParameters();
-}
-
-void endAsset(AssetXmlWriter& writer) {
-    writer.endParameters();
-    writer.endPlugin();
-    writer.endAsset();
-}
 
 } // namespace OrvexKavorCore::material

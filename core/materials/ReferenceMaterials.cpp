@@ -7,23 +7,23 @@
 
 namespace OrvexKavorCore {
 
-namespace {
-
-using material::baseRecord;
-using record::field;
-using record::fieldAs;
-using record::since;
-
 // The identifier record inside a linked material's record.
-struct IdDataItem {
+template <>
+struct record::Codec<MaterialLinked::IdData> {
     static bool read(QuickArchive& ar, MaterialLinked::IdData& id) { return id.readFromArchive(ar); }
     static bool write(QuickArchive& ar, MaterialLinked::IdData& id) { return id.writeToArchive(ar); }
     static bool equal(const MaterialLinked::IdData& a, const MaterialLinked::IdData& b) { return a.isEqual(b); }
 };
 
+namespace {
+
+using kind::baseRecord;
+using record::field;
+using record::since;
+
 constexpr std::array kLinkedFields = {
-    fieldAs<IdDataItem, &MaterialLinked::idData>("idData"),
-    fieldAs<material::Required<MaterialPtr>, &MaterialLinked::linkedMaterial>("linkedMaterial"),
+    field<&MaterialLinked::idData>("idData"),
+    record::fieldAs<material::Required<MaterialPtr>, &MaterialLinked::linkedMaterial>("linkedMaterial"),
     baseRecord<MaterialLinked>(),
 };
 
@@ -33,7 +33,7 @@ constexpr std::array kInstanceFields = {baseRecord<MaterialInstance>()};
 constexpr std::array kReferenceFields = {
     baseRecord<MaterialReference>(),
     field<&MaterialReference::targetId>("targetId"),
-    fieldAs<material::Optional<MaterialPtr>, &MaterialReference::heldMaterial>("heldMaterial", since(2)),
+    field<&MaterialReference::heldMaterial>("heldMaterial", since(2)),
 };
 
 } // namespace
@@ -64,8 +64,7 @@ bool MaterialLinked::IdData::writeToArchive(QuickArchive& ar) {
 }
 
 bool MaterialLinked::IdData::readFromArchive(QuickArchive& ar) {
-    const auto version = ar.get<VersionWord>();
-    if (!version.is(0, 1)) return material::refuseVersion(ar, "link identifier", version);
+    if (!ar.readVersion(1, "link identifier")) return false;
     tag_ = static_cast<std::int32_t>(ar.get<std::uint32_t>());
     if (tag_ == 0 || tag_ == kTextTag) return ar.readWString(text_);
     if (tag_ == kIntegerTag) {

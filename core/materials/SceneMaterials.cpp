@@ -247,10 +247,9 @@ bool SceneMaterials::writeToArchive(QuickArchive& ar) {
 
 bool SceneMaterials::readFromArchive(QuickArchive& ar) {
     clear();
-    const auto version = ar.get<VersionWord>();
-    if (version.first() != 0 || version.second() < 1 || version.second() > 2)
-        return material::refuseVersion(ar, "material library", version);
-    const bool older = version.second() == 1;
+    const auto version = ar.readVersion(2, "material library");
+    if (!version) return false;
+    const bool older = version->second() == 1;
 
     const auto count = ar.get<std::uint32_t>();
     if (!ar.canHold(count, 8))
@@ -258,13 +257,17 @@ bool SceneMaterials::readFromArchive(QuickArchive& ar) {
     for (std::uint32_t i = 0; i < count; ++i) {
         MaterialPtr material;
         if (!readMember(ar, material, nullptr, i)) return false;
+        // A name taken already fails the read in both versions: the later
+        // material would be lost, and its identifier would name the other one.
+        bool joined;
         if (older) {
-            if (!add(material))
-                return ar.fail("the material \"" + material->name + "\" cannot join the library: its name is taken");
+            joined = add(material);
         } else {
             std::unique_lock lock(mutex_);
-            byName_.emplace(material->name, material);
+            joined = byName_.emplace(material->name, material).second;
         }
+        if (!joined)
+            return ar.fail("the material \"" + material->name + "\" cannot join the library: its name is taken");
     }
     if (older) return true;
 

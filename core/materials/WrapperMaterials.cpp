@@ -9,37 +9,33 @@ namespace OrvexKavorCore {
 
 namespace {
 
-using material::baseRecord;
+using kind::baseRecord;
+using kind::reference;
+using kind::value;
 using material::copyMember;
-using material::writeAssetOf;
-using material::Optional;
-using material::Required;
+using material::subMaterial;
 using record::field;
-using record::fieldAs;
 using record::since;
-
-template <auto M>
-constexpr auto optionalMaterial(const char* name) {
-    return fieldAs<Optional<MaterialPtr>, M>(name);
-}
-template <auto M>
-constexpr auto optionalTexture(const char* name) {
-    return fieldAs<Optional<TexturePtr>, M>(name);
-}
 
 // --- bump: the current record (older ones are read by hand) ---
 
 constexpr std::array kBumpFields = {
     field<&MaterialBump::bumpTexMult>("bumpTexMult"),
-    optionalTexture<&MaterialBump::bumpTex>("bumpTex"),
-    fieldAs<Required<MaterialPtr>, &MaterialBump::baseMtl>("baseMtl"),
+    field<&MaterialBump::bumpTex>("bumpTex"),
+    record::fieldAs<material::Required<MaterialPtr>, &MaterialBump::baseMtl>("baseMtl"),
     baseRecord<MaterialBump>(),
+};
+
+constexpr std::array kBumpParameters = {
+    value<&MaterialBump::bumpTexMult>("bump_tex_mult"),
+    subMaterial<&MaterialBump::baseMtl>("base_mtl"),
+    reference<&MaterialBump::bumpTex>("bump_tex", "bump_tex"),
 };
 
 constexpr std::array kDisplacedFields = {
     baseRecord<MaterialDisplaced>(),
-    optionalMaterial<&MaterialDisplaced::baseMtl>("baseMtl"),
-    optionalTexture<&MaterialDisplaced::displaceTex>("displaceTex"),
+    field<&MaterialDisplaced::baseMtl>("baseMtl"),
+    field<&MaterialDisplaced::displaceTex>("displaceTex"),
     field<&MaterialDisplaced::displaceTexMult>("displaceTexMult"),
     field<&MaterialDisplaced::displaceShift>("displaceShift", since(2)),
     field<&MaterialDisplaced::displaceEdgeLength>("displaceEdgeLength", since(2)),
@@ -51,11 +47,11 @@ constexpr std::array kDisplacedFields = {
 
 constexpr std::array kOverrideFields = {
     baseRecord<MaterialOverrideEnvironment>(),
-    optionalMaterial<&MaterialOverrideEnvironment::baseMtl>("baseMtl"),
-    optionalTexture<&MaterialOverrideEnvironment::bgTex>("bgTex"),
-    optionalTexture<&MaterialOverrideEnvironment::giTex>("giTex"),
-    optionalTexture<&MaterialOverrideEnvironment::reflectTex>("reflectTex"),
-    optionalTexture<&MaterialOverrideEnvironment::refractTex>("refractTex"),
+    field<&MaterialOverrideEnvironment::baseMtl>("baseMtl"),
+    field<&MaterialOverrideEnvironment::bgTex>("bgTex"),
+    field<&MaterialOverrideEnvironment::giTex>("giTex"),
+    field<&MaterialOverrideEnvironment::reflectTex>("reflectTex"),
+    field<&MaterialOverrideEnvironment::refractTex>("refractTex"),
     field<&MaterialOverrideEnvironment::bgColor>("bgColor"),
     field<&MaterialOverrideEnvironment::giColor>("giColor"),
     field<&MaterialOverrideEnvironment::reflectColor>("reflectColor"),
@@ -72,34 +68,55 @@ constexpr std::array kOverrideFields = {
 
 constexpr std::array kExclusionFields = {
     field<&MaterialObjectExclusion::mode>("mode"),
-    optionalMaterial<&MaterialObjectExclusion::baseMtl>("baseMtl"),
-    fieldAs<material::TextList, &MaterialObjectExclusion::objects>("objects"),
+    field<&MaterialObjectExclusion::baseMtl>("baseMtl"),
+    field<&MaterialObjectExclusion::objects>("objects"),
     baseRecord<MaterialObjectExclusion>(since(2)),
     field<&MaterialObjectExclusion::shortCircuit>("shortCircuit", since(3)),
 };
 
+constexpr std::array kExclusionParameters = {
+    subMaterial<&MaterialObjectExclusion::baseMtl>("base_mtl"),
+    value<&MaterialObjectExclusion::mode>("mode"),
+    value<&MaterialObjectExclusion::shortCircuit>("short_circuit"),
+    // The object names: a "string" list.
+    kind::ParameterRow<MaterialObjectExclusion>{
+        "objects", nullptr, nullptr, nullptr,
+        [](AssetXmlWriter& w, const char* n, const MaterialObjectExclusion& o, const std::string&) {
+            w.beginList(n, "string");
+            for (const std::string& object : o.objects) w.writeStringEntry(object);
+            w.endList();
+        }},
+};
+
 constexpr std::array kAlphaFields = {
     baseRecord<MaterialAlphaContribution>(),
-    optionalMaterial<&MaterialAlphaContribution::baseMtl>("baseMtl"),
-    optionalTexture<&MaterialAlphaContribution::alphaTex>("alphaTex"),
+    field<&MaterialAlphaContribution::baseMtl>("baseMtl"),
+    field<&MaterialAlphaContribution::alphaTex>("alphaTex"),
     field<&MaterialAlphaContribution::alphaTexMult>("alphaTexMult"),
     field<&MaterialAlphaContribution::alpha>("alpha"),
 };
 
+constexpr std::array kAlphaParameters = {
+    value<&MaterialAlphaContribution::alpha>("alpha"),
+    value<&MaterialAlphaContribution::alphaTexMult>("alpha_tex_mult"),
+    subMaterial<&MaterialAlphaContribution::baseMtl>("base_mtl"),
+    reference<&MaterialAlphaContribution::alphaTex>("alpha_tex", "alpha_tex"),
+};
+
 constexpr std::array kToonFields = {
-    optionalMaterial<&MaterialToon::baseMtl>("baseMtl"),
+    field<&MaterialToon::baseMtl>("baseMtl"),
     field<&MaterialToon::lineWidth>("lineWidth"),
     field<&MaterialToon::lineWidthTexMult>("lineWidthTexMult"),
-    optionalTexture<&MaterialToon::lineWidthTex>("lineWidthTex"),
+    field<&MaterialToon::lineWidthTex>("lineWidthTex"),
     field<&MaterialToon::opacity>("opacity"),
     field<&MaterialToon::opacityTexMult>("opacityTexMult"),
-    optionalTexture<&MaterialToon::opacityTex>("opacityTex"),
+    field<&MaterialToon::opacityTex>("opacityTex"),
     field<&MaterialToon::distort>("distort"),
     field<&MaterialToon::distortTexMult>("distortTexMult"),
-    optionalTexture<&MaterialToon::distortTex>("distortTex"),
+    field<&MaterialToon::distortTex>("distortTex"),
     field<&MaterialToon::lineColor>("lineColor"),
     field<&MaterialToon::lineColorTexMult>("lineColorTexMult"),
-    optionalTexture<&MaterialToon::lineColorTex>("lineColorTex"),
+    field<&MaterialToon::lineColorTex>("lineColorTex"),
     field<&MaterialToon::zThreshold>("zThreshold"),
     field<&MaterialToon::traceBias>("traceBias"),
     field<&MaterialToon::normalThreshold>("normalThreshold"),
@@ -111,12 +128,38 @@ constexpr std::array kToonFields = {
     field<&MaterialToon::silhouetteMult>("silhouetteMult", since(2)),
 };
 
+// The unfolded asset; the folded one (MaterialAssets.cpp) names the same
+// parameters otherwise.
+constexpr std::array kToonParameters = {
+    subMaterial<&MaterialToon::baseMtl>("base_mtl"),
+    reference<&MaterialToon::lineColorTex>("color_tex", "color_tex"),
+    reference<&MaterialToon::distortTex>("distort_tex", "distort_tex"),
+    reference<&MaterialToon::opacityTex>("opacity_tex", "opacity_tex"),
+    reference<&MaterialToon::lineWidthTex>("width_tex", "width_tex"),
+    value<&MaterialToon::lineColor>("color"),
+    value<&MaterialToon::lineColorTexMult>("color_tex_mult"),
+    value<&MaterialToon::distort>("distort"),
+    value<&MaterialToon::distortTexMult>("distort_tex_mult"),
+    value<&MaterialToon::opacity>("opacity"),
+    value<&MaterialToon::opacityTexMult>("opacity_tex_mult"),
+    value<&MaterialToon::lineWidth>("width"),
+    value<&MaterialToon::lineWidthTexMult>("width_tex_mult"),
+    value<&MaterialToon::zThreshold>("z_threshold"),
+    value<&MaterialToon::traceBias>("trace_bias"),
+    value<&MaterialToon::normalThreshold>("normal_threshold"),
+    value<&MaterialToon::lineUnits>("line_units"),
+    value<&MaterialToon::silhouetteMult>("silhouette_mult"),
+    value<&MaterialToon::doSecondary>("do_secondary"),
+    value<&MaterialToon::divideByDist>("divide_by_distance"),
+    value<&MaterialToon::doSilhouetteMult>("do_silhouette_mult"),
+};
 
 } // namespace
 
 // --- MaterialBump ---
 
 std::span<const record::Field<MaterialBump>> MaterialBump::fields() { return kBumpFields; }
+std::span<const kind::ParameterRow<MaterialBump>> MaterialBump::parameters() { return kBumpParameters; }
 
 bool MaterialBump::readVersion(QuickArchive& ar, unsigned version) {
     if (version == 1) {
@@ -140,21 +183,7 @@ bool MaterialBump::readVersion(QuickArchive& ar, unsigned version) {
 }
 
 bool MaterialBump::separate(bool renamed) {
-    return copyMember(baseMtl, renamed) && copyMember(bumpTex);
-}
-
-void MaterialBump::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
-    MaterialWalk walk(MaterialWalk::kXml, this);
-    if (!walk) return;
-    const std::string url = urlPrefix + "/" + name;
-    const std::string bumpUrl = url + "/bump_tex";
-    writeAssetOf(writer, baseMtl, url);
-    writeAssetOf(writer, bumpTex, bumpUrl);
-    material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writeFloat("bump_tex_mult", bumpTexMult);
-    writer.writePluginByName("base_mtl", url, nameOf(baseMtl));
-    writer.writePlugin("bump_tex", bumpTex, bumpUrl);
-    material::endAsset(writer);
+    return copyMember(baseMtl, renamed) && kind::copyChildren(*this, kBumpParameters);
 }
 
 // --- MaterialDisplaced ---
@@ -167,7 +196,7 @@ bool MaterialDisplaced::separate(bool renamed) {
 
 void MaterialDisplaced::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
     MaterialWalk walk(MaterialWalk::kXml, this);
-    if (walk) writeAssetOf(writer, baseMtl, urlPrefix + "/" + name);
+    if (walk && baseMtl) baseMtl->writeXml(writer, urlPrefix + "/" + name);
 }
 
 // --- MaterialOverrideEnvironment ---
@@ -183,98 +212,38 @@ bool MaterialOverrideEnvironment::separate(bool renamed) {
 
 void MaterialOverrideEnvironment::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
     MaterialWalk walk(MaterialWalk::kXml, this);
-    if (walk) writeAssetOf(writer, baseMtl, urlPrefix + "/" + name);
+    if (walk && baseMtl) baseMtl->writeXml(writer, urlPrefix + "/" + name);
 }
 
 // --- MaterialObjectExclusion ---
 
 std::span<const record::Field<MaterialObjectExclusion>> MaterialObjectExclusion::fields() { return kExclusionFields; }
+std::span<const kind::ParameterRow<MaterialObjectExclusion>> MaterialObjectExclusion::parameters() {
+    return kExclusionParameters;
+}
 
 bool MaterialObjectExclusion::separate(bool renamed) { return copyMember(baseMtl, renamed); }
-
-void MaterialObjectExclusion::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
-    MaterialWalk walk(MaterialWalk::kXml, this);
-    if (!walk) return;
-    const std::string url = urlPrefix + "/" + name;
-    writeAssetOf(writer, baseMtl, url);
-    material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writePluginByName("base_mtl", url, nameOf(baseMtl));
-    writer.writeInteger("mode", mode);
-    writer.writeBool("short_circuit", shortCircuit);
-    writer.beginList("objects", "string");
-    for (const std::string& object : objects) writer.writeStringEntry(object);
-    writer.endList();
-    material::endAsset(writer);
-}
 
 // --- MaterialAlphaContribution ---
 
 std::span<const record::Field<MaterialAlphaContribution>> MaterialAlphaContribution::fields() {
     return kAlphaFields;
 }
-
-bool MaterialAlphaContribution::separate(bool renamed) {
-    return copyMember(baseMtl, renamed) && copyMember(alphaTex);
+std::span<const kind::ParameterRow<MaterialAlphaContribution>> MaterialAlphaContribution::parameters() {
+    return kAlphaParameters;
 }
 
-void MaterialAlphaContribution::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
-    MaterialWalk walk(MaterialWalk::kXml, this);
-    if (!walk) return;
-    const std::string url = urlPrefix + "/" + name;
-    const std::string alphaUrl = url + "/alpha_tex";
-    writeAssetOf(writer, baseMtl, url);
-    writeAssetOf(writer, alphaTex, alphaUrl);
-    material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writeFloat("alpha", alpha);
-    writer.writeFloat("alpha_tex_mult", alphaTexMult);
-    writer.writePluginByName("base_mtl", url, nameOf(baseMtl));
-    writer.writePlugin("alpha_tex", alphaTex, alphaUrl);
-    material::endAsset(writer);
+bool MaterialAlphaContribution::separate(bool renamed) {
+    return copyMember(baseMtl, renamed) && kind::copyChildren(*this, kAlphaParameters);
 }
 
 // --- MaterialToon ---
 
 std::span<const record::Field<MaterialToon>> MaterialToon::fields() { return kToonFields; }
+std::span<const kind::ParameterRow<MaterialToon>> MaterialToon::parameters() { return kToonParameters; }
 
 bool MaterialToon::separate(bool) {
-    return copyMember(baseMtl, true) && copyMember(lineColorTex) && copyMember(distortTex) &&
-           copyMember(opacityTex) && copyMember(lineWidthTex);
-}
-
-void MaterialToon::writeXml(AssetXmlWriter& writer, std::string urlPrefix) {
-    MaterialWalk walk(MaterialWalk::kXml, this);
-    if (!walk) return;
-    const std::string url = urlPrefix + "/" + name;
-    const std::string colorUrl = url + "/color_tex", distortUrl = url + "/distort_tex",
-                      opacityUrl = url + "/opacity_tex", widthUrl = url + "/width_tex";
-    writeAssetOf(writer, baseMtl, url);
-    writeAssetOf(writer, lineColorTex, colorUrl);
-    writeAssetOf(writer, distortTex, distortUrl);
-    writeAssetOf(writer, opacityTex, opacityUrl);
-    writeAssetOf(writer, lineWidthTex, widthUrl);
-    material::beginAsset(writer, url, "", kInfo.pluginType);
-    writer.writePluginByName("base_mtl", url, nameOf(baseMtl));
-    writer.writePlugin("color_tex", lineColorTex, colorUrl);
-    writer.writePlugin("distort_tex", distortTex, distortUrl);
-    writer.writePlugin("opacity_tex", opacityTex, opacityUrl);
-    writer.writePlugin("width_tex", lineWidthTex, widthUrl);
-    writer.writeColor("color", lineColor);
-    writer.writeFloat("color_tex_mult", lineColorTexMult);
-    writer.writeFloat("distort", distort);
-    writer.writeFloat("distort_tex_mult", distortTexMult);
-    writer.writeFloat("opacity", opacity);
-    writer.writeFloat("opacity_tex_mult", opacityTexMult);
-    writer.writeFloat("width", lineWidth);
-    writer.writeFloat("width_tex_mult", lineWidthTexMult);
-    writer.writeFloat("z_threshold", zThreshold);
-    writer.writeFloat("trace_bias", traceBias);
-    writer.writeFloat("normal_threshold", normalThreshold);
-    writer.writeFloat("line_units", lineUnits);
-    writer.writeFloat("silhouette_mult", silhouetteMult);
-    writer.writeBool("do_secondary", doSecondary);
-    writer.writeBool("divide_by_distance", divideByDist);
-    writer.writeBool("do_silhouette_mult", doSilhouetteMult);
-    material::endAsset(writer);
+    return copyMember(baseMtl, true) && kind::copyChildren(*this, kToonParameters);
 }
 
 } // namespace OrvexKavorCore

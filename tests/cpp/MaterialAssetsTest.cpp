@@ -229,3 +229,105 @@ TEST_F(FoldingTest, WholeFilesInAllThreeGenerations) {
         std::filesystem::remove(path);
     }
 }
+
+// --- the unfolded assets (a material's own writeXml) ---
+
+namespace {
+
+// The values of `attribute` in every `tag` of the document, in order.
+std::vector<std::string> allOf(const std::string& xml, const std::string& tag, const std::string& attribute) {
+    std::vector<std::string> found;
+    const std::string key = " " + attribute + "=\"";
+    for (std::size_t at = xml.find(tag); at != std::string::npos; at = xml.find(tag, at + 1)) {
+        const std::size_t value = xml.find(key, at);
+        if (value == std::string::npos || value > xml.find('>', at)) continue;
+        const std::size_t begin = value + key.size();
+        found.push_back(xml.substr(begin, xml.find('"', begin) - begin));
+    }
+    return found;
+}
+
+// The urls of the assets written, and the parameter names of the last one.
+std::pair<std::vector<std::string>, std::vector<std::string>> unfolded(BaseMaterial& m) {
+    std::string xml;
+    AssetXmlWriter writer(xml);
+    m.writeXml(writer, "/Lib");
+    const std::size_t last = xml.rfind("<Asset ");
+    return {allOf(xml, "<Asset ", "url"),
+            last == std::string::npos ? std::vector<std::string>{} : allOf(xml.substr(last), "<parameter ", "name")};
+}
+
+using Names = std::vector<std::string>;
+
+} // namespace
+
+// Each kind's own asset comes after the assets it refers to, in parameter order:
+// a sub-material's under the material's url, a texture's under its child name.
+// The wrappers without an asset of their own write only their base material's;
+// the kinds that stand for other materials write nothing.
+TEST_F(FoldingTest, UnfoldedAssetsOfEveryKind) {
+    const auto inner = [] { return make<MaterialLayeredBRDF>("Inner"); };
+    const TexturePtr texture = boost::make_shared<AColorTexture>();
+
+    auto bump = bumpAround("M", inner());
+    bump->bumpTex = texture;
+    EXPECT_EQ(unfolded(*bump), std::pair(Names{"/Lib/M/Inner", "/Lib/M/bump_tex", "/Lib/M"},
+                                         Names{"bump_tex_mult", "base_mtl", "bump_tex"}));
+    std::string xml;
+    AssetXmlWriter writer(xml);
+    bump->writeXml(writer, "/Lib");
+    EXPECT_NE(xml.find("<value>/Lib/M/Inner</value>"), std::string::npos) << xml;
+    EXPECT_NE(xml.find("<value>/Lib/M/bump_tex/TexAColor</value>"), std::string::npos) << xml;
+
+    auto exclusion = make<MaterialObjectExclusion>("M");
+    exclusion->baseMtl = inner();
+    exclusion->objects = {"a", "b"};
+    EXPECT_EQ(unfolded(*exclusion),
+              std::pair(Names{"/Lib/M/Inner", "/Lib/M"}, Names{"base_mtl", "mode", "short_circuit", "objects"}));
+
+    auto alpha = make<MaterialAlphaContribution>("M");
+    alpha->alphaTex = texture;
+    EXPECT_EQ(unfolded(*alpha), std::pair(Names{"/Lib/M/alpha_tex", "/Lib/M"},
+                                          Names{"alpha", "alpha_tex_mult", "base_mtl", "alpha_tex"}));
+
+    auto toon = make<MaterialToon>("M");
+    toon->baseMtl = inner();
+    toon->opacityTex = texture;
+    EXPECT_EQ(unfolded(*toon),
+              std::pair(Names{"/Lib/M/Inner", "/Lib/M/opacity_tex", "/Lib/M"},
+                        Names{"base_mtl", "color_tex", "distort_tex", "opacity_tex", "width_tex", "color",
+                              "color_tex_mult", "distort", "distort_tex_mult", "opacity", "opacity_tex_mult",
+                              "width", "width_tex_mult", "z_threshold", "trace_bias", "normal_threshold",
+                              "line_units", "silhouette_mult", "do_secondary", "divide_by_distance",
+                              "do_silhouette_mult"}));
+
+    auto twoSided = make<Material2Sided>("M");
+    twoSided->back = inner();
+    twoSided->transparencyTex = texture;
+    EXPECT_EQ(unfolded(*twoSided),
+              std::pair(Names{"/Lib/M/Inner", "/Lib/M/transparency_tex", "/Lib/M"},
+                        Names{"front", "back", "translucency_tex", "transparency_tex", "translucency", "transparency",
+                              "translucency_tex_mult", "transparency_tex_mult", "force_1sided"}));
+
+    auto host = make<MaterialSkp2Sided>("M");
+    host->front = inner();
+    EXPECT_EQ(unfolded(*host), std::pair(Names{"/Lib/M/Inner", "/Lib/M"}, Names{"front", "back", "force_1sided"}));
+
+    auto blend = make<MaterialAngleBlend>("M");
+    blend->mtlOne = inner();
+    blend->mtlTwo = inner();
+    EXPECT_EQ(unfolded(*blend), std::pair(Names{"/Lib/M/Inner", "/Lib/M/Inner", "/Lib/M"},
+                                          Names{"mtl_one", "mtl_two", "start_angle", "stop_angle"}));
+
+    auto displaced = make<MaterialDisplaced>("M");
+    displaced->baseMtl = inner();
+    displaced->displaceTex = texture;
+    EXPECT_EQ(unfolded(*displaced).first, Names{"/Lib/M/Inner"});
+    auto environment = make<MaterialOverrideEnvironment>("M");
+    environment->giTex = texture;
+    EXPECT_TRUE(unfolded(*environment).first.empty());
+
+    auto reference = make<MaterialReference>("M");
+    reference->heldMaterial = inner();
+    EXPECT_TRUE(unfolded(*reference).first.empty());
+}

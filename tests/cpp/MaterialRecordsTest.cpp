@@ -308,6 +308,11 @@ TEST_F(MaterialRecordsTest, BaseRecordAndRefusedVersions) {
     QuickArchive ar;
     EXPECT_FALSE(texturetest::readInto(instance, Image().version(0, 1).version(0, 3).text("x").bytes, &ar));
     EXPECT_EQ(ar.failure()->reason, "unknown base material record version (0, 3)");
+    // The link identifier inside a linked material's record has versions of its own.
+    MaterialLinked linked;
+    QuickArchive linkAr;
+    EXPECT_FALSE(texturetest::readInto(linked, Image().version(0, 1).version(0, 2).u32(2).i32(5).bytes, &linkAr));
+    EXPECT_EQ(linkAr.failure()->reason, "unknown link identifier version (0, 2)");
 
     // Every kind refuses versions beyond its own, versions 0 and a first half other than 0.
     Random rnd(7);
@@ -367,6 +372,14 @@ TEST_F(MaterialRecordsTest, ResetsAndReadingOver) {
     toon->lineWidth = 7.0f;
     toon->resetToDefaults();
     EXPECT_TRUE(toon->name == "Keep" && toon->lineWidth == 1.5f);
+
+    // A refused version comes after the reset: the kinds that reset are at their
+    // defaults, the others keep their fields.
+    toon->lineWidth = 7.0f;
+    twoSided->force1Sided = true;
+    EXPECT_FALSE(readInto(*toon, Image().version(0, 3).bytes));
+    EXPECT_FALSE(readInto(*twoSided, Image().version(0, 4).bytes));
+    EXPECT_TRUE(toon->lineWidth == 1.5f && toon->name == "Keep" && twoSided->force1Sided);
 }
 
 TEST_F(MaterialRecordsTest, Copies) {
@@ -399,6 +412,18 @@ TEST_F(MaterialRecordsTest, Copies) {
     const auto toonCopy = as<MaterialToon>(toon->clone());
     EXPECT_TRUE(toonCopy->name == "Toon" && toonCopy->baseMtl->name == "Base1");
     EXPECT_NE(toonCopy->opacityTex, toon->opacityTex);
+
+    // The wrappers' textures are copied with them.
+    auto bump = make<MaterialBump>("Bump");
+    bump->baseMtl = layered;
+    bump->bumpTex = boost::make_shared<AColorTexture>();
+    auto alpha = make<MaterialAlphaContribution>("Alpha");
+    alpha->alphaTex = boost::make_shared<AColorTexture>();
+    const auto bumpCopy = as<MaterialBump>(bump->cloneRenamed());
+    const auto alphaCopy = as<MaterialAlphaContribution>(alpha->clone());
+    EXPECT_TRUE(bumpCopy->bumpTex && bumpCopy->bumpTex != bump->bumpTex && bumpCopy->baseMtl->name == "Base1");
+    EXPECT_TRUE(alphaCopy->alphaTex && alphaCopy->alphaTex != alpha->alphaTex && !alphaCopy->baseMtl);
+    EXPECT_TRUE(bumpCopy->isEqual(bump) && alphaCopy->isEqual(alpha));
 
     auto reference = make<MaterialReference>("Base");
     reference->heldMaterial = layered;

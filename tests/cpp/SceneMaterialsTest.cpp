@@ -215,6 +215,13 @@ TEST_F(SceneMaterialsTest, LibraryRecord) {
     EXPECT_FALSE(readLibrary(library(), twice.bytes, &why));
     EXPECT_NE(why.find("\"Oak\" cannot join the library"), std::string::npos) << why;
     EXPECT_EQ(library().size(), 1u);
+    // So in version 2, where the stored names are kept as they are.
+    Image twiceV2;
+    twiceV2.version(0, 2).u32(2).append(storedForm(bump)).append(storedForm(bump)).u32(0);
+    why.clear();
+    EXPECT_FALSE(readLibrary(library(), twiceV2.bytes, &why));
+    EXPECT_NE(why.find("\"Bumpy\" cannot join the library"), std::string::npos) << why;
+    EXPECT_EQ(library().size(), 1u);
     EXPECT_FALSE(readLibrary(library(), Image().version(0, 3).u32(0).bytes, &why));
     EXPECT_NE(why.find("unknown material library version (0, 3)"), std::string::npos) << why;
     EXPECT_FALSE(readLibrary(library(), Image().version(0, 2).u32(500000000).bytes, &why));

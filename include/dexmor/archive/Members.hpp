@@ -5,6 +5,7 @@
 // BRDF, texture, UVW generator, bitmap, light) gives its creation function through
 // Family<Base>, which each family header specialises.
 #include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/archive/Record.hpp>
 
 #include <boost/shared_ptr.hpp>
 
@@ -71,5 +72,19 @@ template <class Base>
 boost::shared_ptr<Base> cloneMember(const boost::shared_ptr<Base>& member) {
     return member ? member->clone() : boost::shared_ptr<Base>();
 }
+
+// A member in a record table (archive/Record.hpp) is optional:
+// record::field<&X::texture> stores it as readOptionalMember does. A mandatory
+// member is stored with an encoding of its own (record::fieldAs).
+template <class Base>
+struct record::Codec<boost::shared_ptr<Base>> {
+    static bool read(QuickArchive& ar, boost::shared_ptr<Base>& member) { return readOptionalMember(ar, member); }
+    static bool write(QuickArchive& ar, const boost::shared_ptr<Base>& member) {
+        return writeOptionalMember(ar, member);
+    }
+    static bool equal(const boost::shared_ptr<Base>& a, const boost::shared_ptr<Base>& b) {
+        return membersEqual(a, b);
+    }
+};
 
 } // namespace OrvexKavorCore

@@ -12,10 +12,10 @@ namespace OrvexKavorCore {
 
 class Diffuse_BRDF final : public BRDFKind<Diffuse_BRDF> {
 public:
-    static constexpr BRDFKindInfo kInfo{.kind = kDiffuse, .version = 3, .pluginType = "BRDFDiffuse",
-                                        .what = "diffuse BRDF"};
+    static constexpr KindInfo kInfo{.kind = kDiffuse, .version = 3, .pluginType = "BRDFDiffuse",
+                                    .what = "diffuse BRDF"};
     static std::span<const record::Field<Diffuse_BRDF>> fields();
-    static std::span<const brdf::Parameter<Diffuse_BRDF>> parameters();
+    static std::span<const kind::ParameterRow<Diffuse_BRDF>> parameters();
 
     Color color{0.5f, 0.5f, 0.5f};
     Color transparency{0.0f, 0.0f, 0.0f};

@@ -27,10 +27,10 @@ namespace OrvexKavorCore {
 
 class Glass_BRDF final : public BRDFKind<Glass_BRDF> {
 public:
-    static constexpr BRDFKindInfo kInfo{.kind = kGlass, .version = 6, .pluginType = "BRDFRefraction",
-                                        .what = "glass BRDF", .keepsFieldsOnRead = true};
+    static constexpr KindInfo kInfo{.kind = kGlass, .version = 6, .pluginType = "BRDFRefraction",
+                                    .what = "glass BRDF", .keepsFieldsOnRead = true};
     static std::span<const record::Field<Glass_BRDF>> fields();
-    static std::span<const brdf::Parameter<Glass_BRDF>> parameters();
+    static std::span<const kind::ParameterRow<Glass_BRDF>> parameters();
 
     Color color{1.0f, 1.0f, 1.0f};
     Color transparency{0.0f, 0.0f, 0.0f};

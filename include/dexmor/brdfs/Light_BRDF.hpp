@@ -18,10 +18,10 @@ namespace OrvexKavorCore {
 
 class Light_BRDF final : public BRDFKind<Light_BRDF> {
 public:
-    static constexpr BRDFKindInfo kInfo{.kind = kLight, .version = 5, .pluginType = "BRDFLight",
-                                        .what = "light BRDF"};
+    static constexpr KindInfo kInfo{.kind = kLight, .version = 5, .pluginType = "BRDFLight",
+                                    .what = "light BRDF"};
     static std::span<const record::Field<Light_BRDF>> fields();
-    static std::span<const brdf::Parameter<Light_BRDF>> parameters();
+    static std::span<const kind::ParameterRow<Light_BRDF>> parameters();
 
     Color color{1.0f, 1.0f, 1.0f};
     Color transparency{0.0f, 0.0f, 0.0f};

@@ -48,10 +48,10 @@ TexturePtr defaultFresnel();
 
 class Mirror_BRDF final : public BRDFKind<Mirror_BRDF> {
 public:
-    static constexpr BRDFKindInfo kInfo{.kind = kMirror, .version = 5, .pluginType = "BRDFReflection",
-                                        .what = "mirror BRDF"};
+    static constexpr KindInfo kInfo{.kind = kMirror, .version = 5, .pluginType = "BRDFReflection",
+                                    .what = "mirror BRDF"};
     static std::span<const record::Field<Mirror_BRDF>> fields();
-    static std::span<const brdf::Parameter<Mirror_BRDF>> parameters();
+    static std::span<const kind::ParameterRow<Mirror_BRDF>> parameters();
 
     Color color{1.0f, 1.0f, 1.0f};
     Color transparency{1.0f, 1.0f, 1.0f};
@@ -71,7 +71,7 @@ template <class Leaf>
 class GlossyReflection : public BRDFKind<Leaf, GlossyReflection<Leaf>> {
 public:
     static std::span<const record::Field<GlossyReflection>> fields();
-    static std::span<const brdf::Parameter<GlossyReflection>> parameters();
+    static std::span<const kind::ParameterRow<GlossyReflection>> parameters();
 
     Color color{1.0f, 1.0f, 1.0f};
     Color transparency{1.0f, 1.0f, 1.0f};
@@ -103,14 +103,14 @@ private:
 
 class Phong_BRDF final : public GlossyReflection<Phong_BRDF> {
 public:
-    static constexpr BRDFKindInfo kInfo{.kind = kPhong, .version = 6, .pluginType = "BRDFReflection",
-                                        .what = "Phong BRDF"};
+    static constexpr KindInfo kInfo{.kind = kPhong, .version = 6, .pluginType = "BRDFReflection",
+                                    .what = "Phong BRDF"};
 };
 
 class Blinn_BRDF final : public GlossyReflection<Blinn_BRDF> {
 public:
-    static constexpr BRDFKindInfo kInfo{.kind = kBlinn, .version = 6, .pluginType = "BRDFReflection",
-                                        .what = "Blinn BRDF"};
+    static constexpr KindInfo kInfo{.kind = kBlinn, .version = 6, .pluginType = "BRDFReflection",
+                                    .what = "Blinn BRDF"};
 };
 
 extern template class GlossyReflection<Phong_BRDF>;

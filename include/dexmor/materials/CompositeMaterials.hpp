@@ -28,12 +28,12 @@ namespace OrvexKavorCore {
 
 class MaterialMulti final : public MaterialKind<MaterialMulti> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kMulti,
-                                            .version = 2,
-                                            .pluginType = "MtlMulti",
-                                            .what = "multi material",
-                                            .resetBeforeRead = false,
-                                            .resetTakesName = true};
+    static constexpr KindInfo kInfo{.kind = kMulti,
+                                    .version = 2,
+                                    .pluginType = "MtlMulti",
+                                    .what = "multi material",
+                                    .keepsFieldsOnRead = true,
+                                    .resetTakesName = true};
     using MaterialKind::MaterialKind;
     ~MaterialMulti() override { releaseMaterialMembers(); }
 
@@ -49,12 +49,11 @@ protected:
 
 class Material2Sided final : public MaterialKind<Material2Sided> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = k2Sided,
-                                            .version = 3,
-                                            .pluginType = "Mtl2Sided",
-                                            .what = "two-sided material",
-                                            .resetBeforeRead = false,
-                                            .resetTakesName = false};
+    static constexpr KindInfo kInfo{.kind = k2Sided,
+                                    .version = 3,
+                                    .pluginType = "Mtl2Sided",
+                                    .what = "two-sided material",
+                                    .keepsFieldsOnRead = true};
     using MaterialKind::MaterialKind;
     ~Material2Sided() override { releaseMaterialMembers(); }
 
@@ -65,8 +64,8 @@ public:
     bool force1Sided = false;
 
     static std::span<const record::Field<Material2Sided>> fields();
+    static std::span<const kind::ParameterRow<Material2Sided>> parameters();
     bool separate(bool renamed);
-    void writeXml(AssetXmlWriter& writer, std::string urlPrefix) override;
 
 protected:
     void takeMaterialMembers(std::vector<MaterialPtr>& out) override;
@@ -74,12 +73,11 @@ protected:
 
 class MaterialSkp2Sided final : public MaterialKind<MaterialSkp2Sided> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kSkp2Sided,
-                                            .version = 1,
-                                            .pluginType = "MtlSkp2Sided",
-                                            .what = "host two-sided material",
-                                            .resetBeforeRead = false,
-                                            .resetTakesName = false};
+    static constexpr KindInfo kInfo{.kind = kSkp2Sided,
+                                    .version = 1,
+                                    .pluginType = "MtlSkp2Sided",
+                                    .what = "host two-sided material",
+                                    .keepsFieldsOnRead = true};
     using MaterialKind::MaterialKind;
     ~MaterialSkp2Sided() override { releaseMaterialMembers(); }
 
@@ -87,8 +85,8 @@ public:
     bool force1Sided = false;
 
     static std::span<const record::Field<MaterialSkp2Sided>> fields();
+    static std::span<const kind::ParameterRow<MaterialSkp2Sided>> parameters();
     bool separate(bool renamed);
-    void writeXml(AssetXmlWriter& writer, std::string urlPrefix) override;
 
 protected:
     void takeMaterialMembers(std::vector<MaterialPtr>& out) override;
@@ -96,12 +94,10 @@ protected:
 
 class MaterialAngleBlend final : public MaterialKind<MaterialAngleBlend> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kAngleBlend,
-                                            .version = 1,
-                                            .pluginType = "MtlAngleBlend",
-                                            .what = "angle blend material",
-                                            .resetBeforeRead = true,
-                                            .resetTakesName = false};
+    static constexpr KindInfo kInfo{.kind = kAngleBlend,
+                                    .version = 1,
+                                    .pluginType = "MtlAngleBlend",
+                                    .what = "angle blend material"};
     using MaterialKind::MaterialKind;
     ~MaterialAngleBlend() override { releaseMaterialMembers(); }
 
@@ -110,8 +106,8 @@ public:
     float stopAngle = 150.0f;
 
     static std::span<const record::Field<MaterialAngleBlend>> fields();
+    static std::span<const kind::ParameterRow<MaterialAngleBlend>> parameters();
     bool separate(bool renamed);
-    void writeXml(AssetXmlWriter& writer, std::string urlPrefix) override;
 
 protected:
     void takeMaterialMembers(std::vector<MaterialPtr>& out) override;

@@ -34,12 +34,11 @@ class AssetXmlWriter;
 
 class MaterialLayeredBRDF final : public MaterialKind<MaterialLayeredBRDF> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kLayeredBRDF,
-                                            .version = 4,
-                                            .pluginType = "MtlORVEX",
-                                            .what = "layered material",
-                                            .resetBeforeRead = true,
-                                            .resetTakesName = true};
+    static constexpr KindInfo kInfo{.kind = kLayeredBRDF,
+                                    .version = 4,
+                                    .pluginType = "MtlORVEX",
+                                    .what = "layered material",
+                                    .resetTakesName = true};
     static constexpr const char* kLayout = "defkvmat";
 
     using MaterialKind::MaterialKind;
@@ -68,12 +67,12 @@ public:
 
 class MaterialSingleBRDF final : public MaterialKind<MaterialSingleBRDF> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kSingleBRDF,
-                                            .version = 2,
-                                            .pluginType = "MtlSingleBRDF",
-                                            .what = "single-BRDF material",
-                                            .resetBeforeRead = false,
-                                            .resetTakesName = true};
+    static constexpr KindInfo kInfo{.kind = kSingleBRDF,
+                                    .version = 2,
+                                    .pluginType = "MtlSingleBRDF",
+                                    .what = "single-BRDF material",
+                                    .keepsFieldsOnRead = true,
+                                    .resetTakesName = true};
 
     using MaterialKind::MaterialKind;
 

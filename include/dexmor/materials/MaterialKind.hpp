@@ -2,20 +2,30 @@
 // What the material kinds share.
 //
 // A material kind is described beside its class by
-//   - kInfo: its kind id, the record version it writes (readers accept 1 to that
-//     version), its plugin type, whether its reader resets the object first, and
-//     whether its reset takes a new default name;
+//   - kInfo (a KindInfo): its kind id, the record version it writes (readers
+//     accept 1 to that version), its plugin type, whether its reader keeps the
+//     current fields (otherwise it resets the object first), and whether its
+//     reset takes a new default name;
 //   - fields(): its record as a table (archive/Record.hpp), each item stored from
-//     some record version on. Besides plain values the items can be members
-//     (material::Optional / Required / List), the base record and the name item
-//     of older records (material::baseRecord / nameItem).
+//     some record version on. Besides plain values the items can be optional
+//     members (record::field), required ones (material::Required), lists of
+//     members or texts, the base record and the name item of older records
+//     (kind::baseRecord, material::nameItem);
+//   - parameters(), for a kind with an unfolded asset of its own: the parameters
+//     of that asset in emission order (kind::ParameterRow). A sub-material
+//     parameter (material::subMaterial) names the material; a texture parameter
+//     (kind::reference) refers to the texture's asset.
 // From these follow, once for all kinds:
 //   record:     VersionWord (0, version), then the items of that version in table
 //               order. Writing is refused, before anything is written, while a
 //               member the record requires is missing (canBeWritten()).
-//   reading:    the version word, a reset when kInfo asks for one (otherwise the
-//               record is read over the current fields, and lists append), then
-//               the items the stored version holds.
+//   reading:    the version word, a reset unless kInfo keeps the fields (then
+//               the record is read over the current fields, and lists append),
+//               then the items the stored version holds.
+//   XML:        url = owner's url + "/" + name. The assets the parameters refer
+//               to, in row order: a sub-material's under url (it adds its own
+//               name), a texture's under url + "/" + its child name; then the
+//               kind's own asset of type "material" with an empty layout.
 //   comparison: same kind, then every item of the table equal: members by their
 //               own comparison (both absent counts as equal), values exactly; the
 //               name and identifier are never compared.
@@ -31,6 +41,7 @@
 #include <dexmor/archive/Record.hpp>
 #include <dexmor/brdfs/Base_BRDF.hpp>
 #include <dexmor/materials/BaseMaterial.hpp>
+#include <dexmor/model/Kind.hpp>
 #include <dexmor/textures/BaseTexture.hpp>
 
 #include <boost/make_shared.hpp>
@@ -44,26 +55,7 @@
 
 namespace OrvexKavorCore {
 
-class AssetXmlWriter;
-
-struct MaterialKindInfo {
-    std::int32_t kind;
-    std::uint16_t version;  // the record version written; readers accept 1 to it
-    const char* pluginType; // "MtlBump"; empty for kinds that stand for other materials
-    const char* what;       // the kind in failure reports ("bump material")
-    bool resetBeforeRead;   // the reader resets first, so missing fields keep defaults
-    bool resetTakesName;    // the reset also takes a fresh default name (the base reset)
-};
-
 namespace material {
-
-// A member behind a Bool present flag.
-template <class Ptr>
-struct Optional {
-    static bool read(QuickArchive& ar, Ptr& p) { return readOptionalMember(ar, p); }
-    static bool write(QuickArchive& ar, const Ptr& p) { return writeOptionalMember(ar, p); }
-    static bool equal(const Ptr& a, const Ptr& b) { return membersEqual(a, b); }
-};
 
 // A member stored as its kind id and record, without a flag.
 template <class Ptr>
@@ -109,18 +101,6 @@ struct TextList {
     static bool equal(const std::vector<std::string>& a, const std::vector<std::string>& b) { return a == b; }
 };
 
-// The base record at its place in a kind's record. Never compared.
-template <class Obj>
-constexpr record::Field<Obj> baseRecord(record::Versions versions = record::always()) {
-    return record::Field<Obj>{
-        "base record",
-        versions,
-        [](QuickArchive& ar, Obj& o) { return o.readBaseRecord(ar); },
-        [](QuickArchive& ar, Obj& o) { return o.writeBaseRecord(ar); },
-        [](const Obj&, const Obj&) { return true; },
-    };
-}
-
 // The name item of older records (see BaseMaterial::readNameItem). Never compared.
 template <class Obj>
 constexpr record::Field<Obj> nameItem(record::Versions versions) {
@@ -136,14 +116,6 @@ constexpr record::Field<Obj> nameItem(record::Versions versions) {
     };
 }
 
-// Opens a material's asset (asset type "material"), its plugin (name
-// `pluginType`) and its parameter list; endAsset closes them.
-void beginAsset(AssetXmlWriter& writer, std::string_view url, std::string_view layout, std::string_view pluginType);
-void endAsset(AssetXmlWriter& writer);
-
-// "unknown <what> version (a, b)"; returns false.
-bool refuseVersion(QuickArchive& ar, const char* what, VersionWord version);
-
 // Replace a member by its own copy: a sub-material by its clone() or (renamed)
 // cloneRenamed(), a texture or BRDF layer by its clone(). False when a present
 // member could not be copied (a tree deeper than the walk limit).
@@ -154,12 +126,29 @@ bool copyMember(BRDFPtr& b);
 // The library's unique name for `source`.
 std::string uniqueName(const std::string& source);
 
-// The own asset of a sub-material or texture, when there is one.
-inline void writeAssetOf(AssetXmlWriter& writer, const MaterialPtr& m, const std::string& url) {
-    if (m) m->writeXml(writer, url);
+// A "plugin" parameter naming the sub-material M (an absent one gives the
+// parameter without a value); the sub-material's own asset is written under the
+// url of the material that holds it.
+template <auto M>
+constexpr kind::ParameterRow<kind::ClassOf<M>> subMaterial(const char* name) {
+    using Obj = kind::ClassOf<M>;
+    return {
+        name,
+        nullptr,
+        [](const Obj& o) { return static_cast<bool>(o.*M); },
+        [](AssetXmlWriter& w, const Obj& o, const std::string& url) { (o.*M)->writeXml(w, url); },
+        [](AssetXmlWriter& w, const char* n, const Obj& o, const std::string& url) {
+            w.writePluginByName(n, url, nameOf(o.*M));
+        },
+    };
 }
-inline void writeAssetOf(AssetXmlWriter& writer, const TexturePtr& t, const std::string& url) {
-    if (t) t->writeXml(writer, url);
+
+// Writes the assets the rows refer to, in row order: a present sub-material's
+// under `url`, a present texture's under url + "/" + its child name.
+template <class Obj, class Rows>
+void writeMemberAssets(AssetXmlWriter& writer, const Obj& object, const std::string& url, const Rows& rows) {
+    for (const kind::ParameterRow<Obj>& p : rows)
+        if (p.writeChild && p.isSet(object)) p.writeChild(writer, object, p.child ? url + "/" + p.child : url);
 }
 
 // Moves a sub-material into `out` when there is one.
@@ -169,9 +158,18 @@ inline void take(MaterialPtr& m, std::vector<MaterialPtr>& out) {
 
 } // namespace material
 
+// Lists of members and of texts have one encoding each.
+template <>
+struct record::Codec<std::vector<MaterialPtr>> : material::List<MaterialPtr> {};
+template <>
+struct record::Codec<std::vector<BRDFPtr>> : material::List<BRDFPtr> {};
+template <>
+struct record::Codec<std::vector<std::string>> : material::TextList {};
+
 // The shared implementation of a material kind. `Derived` provides
-//   static constexpr MaterialKindInfo kInfo;
+//   static constexpr KindInfo kInfo;
 //   static std::span<const record::Field<Derived>> fields();
+//   static std::span<const kind::ParameterRow<Derived>> parameters(); // when it has an asset
 // declares its fields with their defaults as member initialisers, inherits the
 // constructors (`using MaterialKind::MaterialKind;`), and may hide
 //   bool canBeWritten() const;                 // the members the record requires
@@ -219,10 +217,23 @@ public:
 
     bool readFromArchive(QuickArchive& ar) override {
         const auto version = ar.get<VersionWord>();
-        if constexpr (Derived::kInfo.resetBeforeRead) resetToDefaults();
-        if (version.first() != 0 || version.second() < 1 || version.second() > Derived::kInfo.version)
-            return material::refuseVersion(ar, Derived::kInfo.what, version);
+        // A refused version leaves the material reset.
+        if constexpr (!Derived::kInfo.keepsFieldsOnRead) resetToDefaults();
+        if (!ar.checkVersion(version, Derived::kInfo.version, Derived::kInfo.what)) return false;
         return self().readVersion(ar, version.second());
+    }
+
+    // The unfolded asset of a kind with parameters(); nothing for the others.
+    void writeXml(AssetXmlWriter& writer, std::string urlPrefix) override {
+        if constexpr (requires { Derived::parameters(); }) {
+            MaterialWalk walk(MaterialWalk::kXml, this);
+            if (!walk) return;
+            const std::string url = urlPrefix + "/" + name;
+            material::writeMemberAssets(writer, self(), url, Derived::parameters());
+            kind::beginAsset(writer, url, "material", Derived::kInfo.pluginType);
+            kind::writeParameters(writer, self(), url, Derived::parameters());
+            kind::endAsset(writer);
+        }
     }
 
     // --- the parts a kind may hide ---

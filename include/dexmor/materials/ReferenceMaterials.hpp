@@ -30,12 +30,10 @@ namespace OrvexKavorCore {
 
 class MaterialLinked final : public MaterialKind<MaterialLinked> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kLinked,
-                                            .version = 1,
-                                            .pluginType = "",
-                                            .what = "linked material",
-                                            .resetBeforeRead = true,
-                                            .resetTakesName = false};
+    static constexpr KindInfo kInfo{.kind = kLinked,
+                                    .version = 1,
+                                    .pluginType = "",
+                                    .what = "linked material"};
 
     // A tagged identifier: tags 0 and 1 hold a text, tag 2 an integer.
     //   VersionWord (0, 1), UInt32 tag, then WString text (tags 0, 1) or Int32 (tag 2).
@@ -82,12 +80,12 @@ protected:
 
 class MaterialInstance final : public MaterialKind<MaterialInstance> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kInstance,
-                                            .version = 1,
-                                            .pluginType = "",
-                                            .what = "instance material",
-                                            .resetBeforeRead = false,
-                                            .resetTakesName = true};
+    static constexpr KindInfo kInfo{.kind = kInstance,
+                                    .version = 1,
+                                    .pluginType = "",
+                                    .what = "instance material",
+                                    .keepsFieldsOnRead = true,
+                                    .resetTakesName = true};
     using MaterialKind::MaterialKind;
     ~MaterialInstance() override { releaseMaterialMembers(); }
 
@@ -105,12 +103,12 @@ protected:
 
 class MaterialReference final : public MaterialKind<MaterialReference> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kReference,
-                                            .version = 2,
-                                            .pluginType = "",
-                                            .what = "reference material",
-                                            .resetBeforeRead = false,
-                                            .resetTakesName = true};
+    static constexpr KindInfo kInfo{.kind = kReference,
+                                    .version = 2,
+                                    .pluginType = "",
+                                    .what = "reference material",
+                                    .keepsFieldsOnRead = true,
+                                    .resetTakesName = true};
     using MaterialKind::MaterialKind;
     ~MaterialReference() override { releaseMaterialMembers(); }
 

@@ -41,12 +41,12 @@ namespace OrvexKavorCore {
 
 class MaterialBump final : public MaterialKind<MaterialBump> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kBump,
-                                            .version = 3,
-                                            .pluginType = "MtlBump",
-                                            .what = "bump material",
-                                            .resetBeforeRead = false,
-                                            .resetTakesName = true};
+    static constexpr KindInfo kInfo{.kind = kBump,
+                                    .version = 3,
+                                    .pluginType = "MtlBump",
+                                    .what = "bump material",
+                                    .keepsFieldsOnRead = true,
+                                    .resetTakesName = true};
     using MaterialKind::MaterialKind;
     ~MaterialBump() override { releaseMaterialMembers(); }
 
@@ -55,10 +55,10 @@ public:
     float bumpTexMult = 1.0f;
 
     static std::span<const record::Field<MaterialBump>> fields();
+    static std::span<const kind::ParameterRow<MaterialBump>> parameters();
     bool canBeWritten() const { return static_cast<bool>(baseMtl); }
     bool readVersion(QuickArchive& ar, unsigned version);
     bool separate(bool renamed);
-    void writeXml(AssetXmlWriter& writer, std::string urlPrefix) override;
 
 protected:
     void takeMaterialMembers(std::vector<MaterialPtr>& out) override { material::take(baseMtl, out); }
@@ -66,12 +66,10 @@ protected:
 
 class MaterialDisplaced final : public MaterialKind<MaterialDisplaced> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kDisplaced,
-                                            .version = 2,
-                                            .pluginType = "MtlDisplaced",
-                                            .what = "displaced material",
-                                            .resetBeforeRead = true,
-                                            .resetTakesName = false};
+    static constexpr KindInfo kInfo{.kind = kDisplaced,
+                                    .version = 2,
+                                    .pluginType = "MtlDisplaced",
+                                    .what = "displaced material"};
     using MaterialKind::MaterialKind;
     ~MaterialDisplaced() override { releaseMaterialMembers(); }
 
@@ -96,12 +94,10 @@ protected:
 
 class MaterialOverrideEnvironment final : public MaterialKind<MaterialOverrideEnvironment> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kOverrideEnvironment,
-                                            .version = 1,
-                                            .pluginType = "MtlOverrideEnvironment",
-                                            .what = "override environment material",
-                                            .resetBeforeRead = true,
-                                            .resetTakesName = false};
+    static constexpr KindInfo kInfo{.kind = kOverrideEnvironment,
+                                    .version = 1,
+                                    .pluginType = "MtlOverrideEnvironment",
+                                    .what = "override environment material"};
     using MaterialKind::MaterialKind;
     ~MaterialOverrideEnvironment() override { releaseMaterialMembers(); }
 
@@ -122,12 +118,10 @@ protected:
 
 class MaterialObjectExclusion final : public MaterialKind<MaterialObjectExclusion> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kObjectExclusion,
-                                            .version = 3,
-                                            .pluginType = "MtlObjectExclusion",
-                                            .what = "object exclusion material",
-                                            .resetBeforeRead = true,
-                                            .resetTakesName = false};
+    static constexpr KindInfo kInfo{.kind = kObjectExclusion,
+                                    .version = 3,
+                                    .pluginType = "MtlObjectExclusion",
+                                    .what = "object exclusion material"};
     using MaterialKind::MaterialKind;
     ~MaterialObjectExclusion() override { releaseMaterialMembers(); }
 
@@ -137,8 +131,8 @@ public:
     bool shortCircuit = true;
 
     static std::span<const record::Field<MaterialObjectExclusion>> fields();
+    static std::span<const kind::ParameterRow<MaterialObjectExclusion>> parameters();
     bool separate(bool renamed);
-    void writeXml(AssetXmlWriter& writer, std::string urlPrefix) override;
 
 protected:
     void takeMaterialMembers(std::vector<MaterialPtr>& out) override { material::take(baseMtl, out); }
@@ -146,12 +140,10 @@ protected:
 
 class MaterialAlphaContribution final : public MaterialKind<MaterialAlphaContribution> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kAlphaContribution,
-                                            .version = 1,
-                                            .pluginType = "MtlAlphaContribution",
-                                            .what = "alpha contribution material",
-                                            .resetBeforeRead = true,
-                                            .resetTakesName = false};
+    static constexpr KindInfo kInfo{.kind = kAlphaContribution,
+                                    .version = 1,
+                                    .pluginType = "MtlAlphaContribution",
+                                    .what = "alpha contribution material"};
     using MaterialKind::MaterialKind;
     ~MaterialAlphaContribution() override { releaseMaterialMembers(); }
 
@@ -161,8 +153,8 @@ public:
     float alpha = 1.0f;
 
     static std::span<const record::Field<MaterialAlphaContribution>> fields();
+    static std::span<const kind::ParameterRow<MaterialAlphaContribution>> parameters();
     bool separate(bool renamed);
-    void writeXml(AssetXmlWriter& writer, std::string urlPrefix) override;
 
 protected:
     void takeMaterialMembers(std::vector<MaterialPtr>& out) override { material::take(baseMtl, out); }
@@ -170,12 +162,10 @@ protected:
 
 class MaterialToon final : public MaterialKind<MaterialToon> {
 public:
-    static constexpr MaterialKindInfo kInfo{.kind = kToon,
-                                            .version = 2,
-                                            .pluginType = "MtlToon",
-                                            .what = "toon material",
-                                            .resetBeforeRead = true,
-                                            .resetTakesName = false};
+    static constexpr KindInfo kInfo{.kind = kToon,
+                                    .version = 2,
+                                    .pluginType = "MtlToon",
+                                    .what = "toon material"};
     using MaterialKind::MaterialKind;
     ~MaterialToon() override { releaseMaterialMembers(); }
 
@@ -202,9 +192,9 @@ public:
     float silhouetteMult = 1.5f;
 
     static std::span<const record::Field<MaterialToon>> fields();
+    static std::span<const kind::ParameterRow<MaterialToon>> parameters();
     // Both copies give the base material a new name (a renamed copy).
     bool separate(bool renamed);
-    void writeXml(AssetXmlWriter& writer, std::string urlPrefix) override;
 
 protected:
     void takeMaterialMembers(std::vector<MaterialPtr>& out) override { material::take(baseMtl, out); }

@@ -6,7 +6,9 @@
 // A kind is described by data kept beside its class (its KindInfo, its record
 // table of archive/Record.hpp, its parameter rows), and the family's kind
 // template derives reading, writing, comparison, copy and XML from that data.
+#include <dexmor/archive/Members.hpp>
 #include <dexmor/archive/QuickArchive.hpp>
+#include <dexmor/archive/Record.hpp>
 #include <dexmor/platform/KavorTypes.hpp>
 #include <dexmor/xml/AssetXmlWriter.hpp>
 
@@ -30,6 +32,9 @@ struct KindInfo {
     // BRDFs: whether a read keeps the kind's own fields; it then resets only the
     // name and the flags, and a field that the stored version lacks keeps its value.
     bool keepsFieldsOnRead = false;
+    // Materials: whether the reset takes a fresh default name (otherwise it keeps
+    // the name). A material that keepsFieldsOnRead resets nothing before a read.
+    bool resetTakesName = false;
 };
 
 namespace kind {
@@ -46,6 +51,19 @@ template <auto M>
 using ClassOf = typename MemberTraits<decltype(M)>::Class;
 template <auto M>
 using TypeOf = typename MemberTraits<decltype(M)>::Type;
+
+// The base record of the family (the object's readBaseRecord / writeBaseRecord)
+// at its place in a kind's record. Never compared.
+template <class Obj>
+constexpr record::Field<Obj> baseRecord(record::Versions versions = record::always()) {
+    return record::Field<Obj>{
+        "base record",
+        versions,
+        [](QuickArchive& ar, Obj& o) { return o.readBaseRecord(ar); },
+        [](QuickArchive& ar, Obj& o) { return o.writeBaseRecord(ar); },
+        [](const Obj&, const Obj&) { return true; },
+    };
+}
 
 // The encoding of a field follows its type: "color", "acolor", "vector",
 // "transform", "float", "integer" (an unsigned count shows as its signed 32-bit
@@ -74,6 +92,9 @@ struct ParameterRow {
     void (*writeChild)(AssetXmlWriter& writer, const Obj& o, const std::string& childUrl) = nullptr;
     // `url` is the child url for a reference, the object's own url otherwise.
     void (*write)(AssetXmlWriter& writer, const char* name, const Obj& o, const std::string& url) = nullptr;
+    // A reference: replaces the member by its deep copy; false when a present
+    // member could not be copied.
+    bool (*copyChild)(Obj& o) = nullptr;
 };
 
 // The parameter `name` showing the field M.
@@ -106,6 +127,11 @@ constexpr ParameterRow<ClassOf<M>> reference(const char* name, const char* child
         [](AssetXmlWriter& w, const char* n, const Obj& o, const std::string& childUrl) {
             w.writePlugin(n, o.*M, childUrl);
         },
+        [](Obj& o) {
+            const bool present = static_cast<bool>(o.*M);
+            o.*M = cloneMember(o.*M);
+            return !present || static_cast<bool>(o.*M);
+        },
     };
 }
 
@@ -115,6 +141,15 @@ template <class Obj, class Rows>
 void writeChildAssets(AssetXmlWriter& writer, const Obj& object, const std::string& url, const Rows& rows) {
     for (const ParameterRow<Obj>& p : rows)
         if (p.child && p.isSet(object)) p.writeChild(writer, object, url + "/" + p.child);
+}
+
+// Replaces every member the rows refer to by its deep copy; false when a present
+// member could not be copied.
+template <class Obj, class Rows>
+bool copyChildren(Obj& object, const Rows& rows) {
+    for (const ParameterRow<Obj>& p : rows)
+        if (p.copyChild && !p.copyChild(object)) return false;
+    return true;
 }
 
 // Writes every row's parameter.
