@@ -117,13 +117,8 @@ constexpr auto fresnelConversion(record::Versions versions) {
 //   static std::span<const kind::ParameterRow<Shape>> parameters();
 // Shape is Leaf itself, except where two kinds share every field (Phong, Blinn).
 template <class Leaf, class Shape = Leaf>
-class BRDFKind : public Base_BRDF {
+class BRDFKind : public kind::Basics<Leaf, Base_BRDF> {
 public:
-    std::int32_t kindId() const override { return Leaf::kInfo.kind; }
-    std::string pluginType() const override { return Leaf::kInfo.pluginType; }
-
-    void resetToDefaults() override { leaf() = Leaf(); }
-
     BRDFPtr clone() const override {
         auto copy = boost::make_shared<Leaf>(leaf());
         kind::copyChildren(static_cast<Shape&>(*copy), Shape::parameters());
@@ -149,15 +144,15 @@ public:
         const auto version = ar.get<VersionWord>();
         // A refused version leaves the layer reset.
         if constexpr (Leaf::kInfo.keepsFieldsOnRead)
-            resetBase();
+            this->resetBase();
         else
-            resetToDefaults();
+            this->resetToDefaults();
         if (!ar.checkVersion(version, Leaf::kInfo.version, Leaf::kInfo.what)) return false;
         return record::readFields(ar, shape(), Shape::fields(), version.second());
     }
 
     void writeXml(AssetXmlWriter& writer, std::string urlPrefix) override {
-        const std::string url = urlPrefix + "/" + name;
+        const std::string url = urlPrefix + "/" + this->name;
         kind::writeChildAssets(writer, shape(), url, Shape::parameters());
         kind::beginAsset(writer, url, "BRDF", Leaf::kInfo.pluginType);
         kind::writeParameters(writer, shape(), url, Shape::parameters());
@@ -165,7 +160,7 @@ public:
     }
 
 protected:
-    BRDFKind() { name = Leaf::kInfo.pluginType; }
+    BRDFKind() { this->name = Leaf::kInfo.pluginType; }
     BRDFKind(const BRDFKind&) = default;
     BRDFKind& operator=(const BRDFKind&) = default;
 
