@@ -67,7 +67,8 @@ SunLight::SunLight(std::string sunName, std::string sunIdentifier)
 void SunLight::writeXml(AssetXmlWriter& writer, std::string /*path*/) {
     auto& urls = PerConversion<DocumentSunUrls>::current().urls;
     if (urls.count(identifier) != 0) return;
-    std::string url = "/" + pluginType();
+    std::string url = "/";
+    url += pluginType();
     if (!urls.empty()) url += std::to_string(urls.size());
     urls.emplace(identifier, url);
     writeAsset(writer, url);
