@@ -69,18 +69,20 @@ struct Field {
     bool (*equal)(const Obj&, const Obj&);
 };
 
-namespace detail {
-
+// The class and the type of a member pointer.
 template <class M>
-struct MemberOf;
+struct MemberTraits;
 template <class C, class T>
-struct MemberOf<T C::*> {
+struct MemberTraits<T C::*> {
     using Class = C;
+    using Type = T;
 };
+
+namespace detail {
 
 template <auto First, auto... Rest>
 struct Path {
-    using Obj = typename MemberOf<decltype(First)>::Class;
+    using Obj = typename MemberTraits<decltype(First)>::Class;
     template <class Self>
     static auto& get(Self& object) {
         return ((object.*First) .* ... .* Rest);

@@ -39,14 +39,7 @@ struct KindInfo {
 
 namespace kind {
 
-// The class and the type of a member pointer.
-template <class M>
-struct MemberTraits;
-template <class C, class T>
-struct MemberTraits<T C::*> {
-    using Class = C;
-    using Type = T;
-};
+using record::MemberTraits;
 template <auto M>
 using ClassOf = typename MemberTraits<decltype(M)>::Class;
 template <auto M>
