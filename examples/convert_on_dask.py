@@ -29,6 +29,7 @@ import argparse
 import logging
 import os
 import sys
+import tempfile
 import time
 
 EXTENSIONS = (".zelmat", ".zelopt")
@@ -65,12 +66,35 @@ def own_text(path):
         return data.decode("latin-1").translate(_CP1252_HIGH)
 
 
-def write_atomically(target, data):
-    """Writes the whole file beside the target, then renames it into place."""
-    temporary = f"{target}.{os.getpid()}.tmp"
+def current_umask():
+    """This process's umask, read where the system shows it, as setting it to read
+    it races with the other threads of a worker creating files."""
     try:
-        with open(temporary, "wb") as file:
+        with open("/proc/self/status", encoding="ascii") as status:
+            for line in status:
+                if line.startswith("Umask:"):
+                    return int(line.split()[1], 8)
+    except (OSError, ValueError, IndexError):
+        pass
+    mask = os.umask(0o077)  # while it is set, a file made elsewhere gets fewer rights, never more
+    os.umask(mask)
+    return mask
+
+
+def write_atomically(target, data):
+    """Writes the whole file beside the target under a new, unpredictable name,
+    then renames it into place. The name is created exclusively, so nothing planted
+    there beforehand (a link to another file, say) is written through or moved
+    onto the target. On failure the temporary file goes and the target stays."""
+    folder, name = os.path.split(target)
+    descriptor, temporary = tempfile.mkstemp(prefix=f".{name}.", suffix=".tmp", dir=folder or None)
+    try:
+        with os.fdopen(descriptor, "wb") as file:
             file.write(data)
+            file.flush()
+            # mkstemp makes the file 0600; give it the mode a plain open would.
+            os.fchmod(file.fileno(), 0o666 & ~current_umask())
+            os.fsync(file.fileno())
         os.replace(temporary, target)
     except BaseException:
         try:

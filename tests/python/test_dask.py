@@ -1,9 +1,13 @@
 """examples/convert_on_dask.py on a local cluster of two worker processes: every
 output equals what the module returns for the file, and the summary lists
-exactly the files that passed through as text."""
+exactly the files that passed through as text. Then one conversion in this
+process, in an output folder where others have planted links."""
+import errno
+import importlib.util
 import os
 import pathlib
 import shutil
+import stat
 import subprocess
 import sys
 
@@ -96,3 +100,41 @@ def test_converts_a_folder_on_two_worker_processes(tmp_path):
         assert size == len(convert(inputs / name).encode("utf-8"))
         if hasattr(Dexmor, "diagnose"):
             assert reason == " ".join(Dexmor.diagnose(str(inputs / name)).split())
+
+
+def test_output_folder_with_planted_links(tmp_path, monkeypatch):
+    """Links planted at names the temporary file could take are neither written
+    through nor renamed onto the target, which gets the mode a plain open gives;
+    a write that fails leaves the previous target and no temporary file."""
+    spec = importlib.util.spec_from_file_location("convert_on_dask", SCRIPT)
+    script = importlib.util.module_from_spec(spec)
+    spec.loader.exec_module(script)
+    sample = SOURCE / "examples" / "sample.zelmat"
+    expected = convert(sample).encode("utf-8")
+    victim, out = tmp_path / "victim", tmp_path / "out"
+    victim.write_bytes(b"not yours")
+    out.mkdir()
+    target = out / "sample.zelmat.xml"
+    planted = [f"{target.name}.{os.getpid()}.tmp", f"{target.name}.tmp", f".{target.name}.tmp", f"{target.name}~"]
+    for name in planted:
+        (out / name).symlink_to(victim)
+
+    umask = os.umask(0o027)
+    try:
+        assert script.convert_one(str(sample), str(target))[1] == "xml"
+    finally:
+        os.umask(umask)
+    assert victim.read_bytes() == b"not yours"
+    assert not target.is_symlink() and target.read_bytes() == expected
+    assert stat.S_IMODE(target.lstat().st_mode) == 0o640
+    assert sorted(os.listdir(out)) == sorted(planted + [target.name])
+
+    def disk_full(descriptor):
+        raise OSError(errno.ENOSPC, os.strerror(errno.ENOSPC))
+
+    monkeypatch.setattr(os, "fsync", disk_full)
+    _, outcome, detail, _ = script.convert_one(str(SOURCE / "examples" / "sample.zelopt"), str(target))
+    monkeypatch.undo()
+    assert outcome == "failed" and "No space left on device" in detail, detail
+    assert target.read_bytes() == expected
+    assert sorted(os.listdir(out)) == sorted(planted + [target.name])
