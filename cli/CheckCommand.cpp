@@ -19,7 +19,7 @@ namespace {
 namespace core = OrvexKavorCore;
 
 std::string lineOf(std::string_view name, const core::Diagnosis& diagnosis) {
-    std::string line(name);
+    std::string line = shownName(name);
     if (diagnosis.readsAsBinary) return line + ": " + diagnosis.description + "\n";
     line += ": not readable as binary: ";
     line += diagnosis.reason();
@@ -54,7 +54,7 @@ int runCheck(Args args) {
     for (const std::string_view name : files) {
         const std::optional<core::FileKind> kind = core::fileKindOf(name);
         if (!kind) {
-            complain({name, ": not checked, the name ends in neither .zelmat nor .zelopt"});
+            complain({shownName(name), ": not checked, the name ends in neither .zelmat nor .zelopt"});
             rejected = true;
             continue;
         }

@@ -3,6 +3,7 @@
 // checked writes to standard output.
 #include <initializer_list>
 #include <span>
+#include <string>
 #include <string_view>
 
 namespace dexmor {
@@ -14,8 +15,16 @@ constexpr int Success = 0;
 constexpr int Failed = 1;   // an output could not be written, a conversion failed, a check found a file not binary
 constexpr int Rejected = 2; // bad usage, or a FILE that cannot be converted
 
+// The status of two outcomes together: the lower non-zero one.
+constexpr int worse(int a, int b) { return a == Success ? b : b == Success ? a : a < b ? a : b; }
+
 // Writes all of `data` to a file descriptor. False, with errno set, on failure.
 bool writeAll(int fd, std::string_view data);
+
+// A file name as messages and reports show it: as it is, unless it holds a
+// control character (a line feed would forge a line of output), then in double
+// quotes with C escapes: "two\nlines".
+std::string shownName(std::string_view name);
 
 // One line on standard error: "dexmor: " and the pieces.
 void complain(std::initializer_list<std::string_view> pieces);
@@ -24,7 +33,8 @@ void complain(std::initializer_list<std::string_view> pieces);
 int usageError(std::initializer_list<std::string_view> pieces);
 
 // Standard output, written unbuffered so that a failure shows at the write that
-// meets it; finish() also checks the close.
+// meets it; finish() also checks the close. A failure is reported once: later
+// writes do nothing and fail.
 class StandardOutput {
 public:
     bool write(std::string_view data);
@@ -32,6 +42,7 @@ public:
 
 private:
     bool used_ = false;
+    bool failed_ = false;
 };
 
 // Writes `text` to standard output: Success, or Failed when it cannot.

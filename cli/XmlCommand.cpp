@@ -1,9 +1,11 @@
-// dexmor xml [-o DIR] [-j N] FILE...
+// dexmor xml [-o DIR] [-j N] [--max-output BYTES] FILE...
 //
 // Converts each FILE and writes its document to standard output (in argument
 // order) or, with -o, to DIR/<file name>.xml. With -o the files are converted on
-// N threads at once; each document is streamed into a temporary file beside its
-// target and renamed over it when complete, so no reader ever sees half a document.
+// N threads at once; each document is streamed into a file that takes the
+// target's place only when complete, so no reader ever sees half a document, and
+// a file that cannot be read or whose XML would exceed the output budget leaves
+// its target as it was.
 #include "Commands.hpp"
 #include "Progress.hpp"
 
@@ -37,6 +39,7 @@ namespace fs = std::filesystem;
 struct XmlArgs {
     std::optional<fs::path> outputDir;
     unsigned jobs = 0; // 0: one per core
+    core::ConversionOptions options;
     std::vector<std::string_view> files;
 };
 
@@ -49,6 +52,13 @@ std::optional<unsigned> parseJobs(std::string_view text) {
     return jobs;
 }
 
+std::optional<std::uint64_t> parseBytes(std::string_view text) {
+    std::uint64_t bytes = 0;
+    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), bytes);
+    if (error != std::errc() || end != text.data() + text.size()) return std::nullopt;
+    return bytes;
+}
+
 enum class Match { No, Missing, Found };
 
 // Whether args[i] is the option with these names, given as "-o DIR", "-oDIR",
@@ -56,7 +66,7 @@ enum class Match { No, Missing, Found };
 Match optionValue(Args args, std::size_t& i, std::string_view shortName, std::string_view longName,
                   std::string_view& value) {
     const std::string_view arg = args[i];
-    if (arg == shortName || arg == longName) {
+    if ((!shortName.empty() && arg == shortName) || arg == longName) {
         if (i + 1 == args.size()) return Match::Missing;
         value = args[++i];
         return Match::Found;
@@ -65,7 +75,7 @@ Match optionValue(Args args, std::size_t& i, std::string_view shortName, std::st
         value = arg.substr(longName.size() + 1);
         return Match::Found;
     }
-    if (!arg.starts_with("--") && arg.starts_with(shortName)) {
+    if (!shortName.empty() && !arg.starts_with("--") && arg.starts_with(shortName)) {
         value = arg.substr(shortName.size());
         return Match::Found;
     }
@@ -102,6 +112,11 @@ std::optional<XmlArgs> parseXmlArgs(Args args, bool& help) {
             const std::optional<unsigned> count = parseJobs(value);
             if (!count) return refuse({"xml: the number of jobs must be from 1 to 1024, not '", value, "'"});
             parsed.jobs = *count;
+        } else if (const Match budget = optionValue(args, i, "", "--max-output", value); budget != Match::No) {
+            if (budget == Match::Missing) return refuse({"xml: option ", arg, " needs a number of bytes"});
+            const std::optional<std::uint64_t> bytes = parseBytes(value);
+            if (!bytes) return refuse({"xml: the output budget must be a number of bytes (0: no limit), not '", value, "'"});
+            parsed.options.maxOutput = *bytes;
         } else {
             return refuse({"xml: unknown option '", arg, "'"});
         }
@@ -135,10 +150,10 @@ std::vector<Job> jobsOf(const std::vector<std::string_view>& files, bool& reject
         const fs::path file{std::string(name)};
         const std::optional<core::FileKind> kind = core::fileKindOf(name);
         if (!kind) {
-            complain({name, ": not converted, the name ends in neither .zelmat nor .zelopt"});
+            complain({shownName(name), ": not converted, the name ends in neither .zelmat nor .zelopt"});
             rejected = true;
         } else if (const std::optional<std::string> why = unreadable(file)) {
-            complain({name, ": not converted, ", *why});
+            complain({shownName(name), ": not converted, ", *why});
             rejected = true;
         } else {
             jobs.push_back(Job{name, file, *kind, {}});
@@ -170,23 +185,40 @@ private:
     bool ended_ = false;
 };
 
-// Converts one FILE into its target under -o, counting the bytes written. The
-// message is empty on success.
-std::string convertToFile(const Job& job, std::uint64_t& bytesWritten) {
-    // The document goes to a temporary file, so a library can be read once: what
-    // it sent before failing is taken back, and the pass-through text follows.
+// How one FILE's conversion ended, with the message for the user when it failed.
+struct Outcome {
+    int status = Success; // Success, Failed or Rejected
+    std::string message;
+};
+
+// The outcome of a conversion that did not give a whole document, or nullopt
+// when it did.
+std::optional<Outcome> incomplete(const Job& job, const core::Diagnosis& result) {
+    if (!result.opened) return Outcome{Rejected, shownName(job.name) + ": not converted, " + result.reason()};
+    if (result.exceededBudget)
+        return Outcome{Failed, shownName(job.name) + ": the XML would exceed " + std::to_string(*result.exceededBudget) +
+                                   " bytes (the output budget; --max-output to change it)"};
+    return std::nullopt;
+}
+
+// Converts one FILE into its target under -o, counting the bytes written.
+Outcome convertToFile(const Job& job, const core::ConversionOptions& options, std::uint64_t& bytesWritten) {
+    // The document goes to a file that has not taken the target's place yet, so a
+    // library can be read once: what it sent before failing is taken back, and
+    // the pass-through text follows.
     core::AtomicFileSink output(job.target);
     bytesWritten = 0;
     try {
         UpToFirstNul cut(output);
-        core::convert(job.kind, job.file, cut);
+        if (std::optional<Outcome> failed = incomplete(job, core::convert(job.kind, job.file, cut, options)))
+            return *failed; // the target stays as it was
     } catch (const std::bad_alloc&) {
-        return std::string(job.name) + ": conversion failed: out of memory";
+        return {Failed, shownName(job.name) + ": conversion failed: out of memory"};
     } catch (const std::exception& error) {
-        return std::string(job.name) + ": conversion failed: " + error.what();
+        return {Failed, shownName(job.name) + ": conversion failed: " + error.what()};
     }
     std::string error;
-    if (!output.commit(&error)) return error;
+    if (!output.commit(&error)) return {Failed, error};
     bytesWritten = output.bytesWritten();
     return {};
 }
@@ -214,24 +246,24 @@ std::vector<Job> assignTargets(std::vector<Job> jobs, const fs::path& dir, bool&
         if (fresh) {
             kept.push_back(std::move(job));
         } else if (!sameFile(earlier->second, job.file)) {
-            complain({job.name, ": not written, ", job.target.native(), " already holds the document of ",
-                      earlier->second.native()});
+            complain({shownName(job.name), ": not written, ", shownName(job.target.native()),
+                      " already holds the document of ", shownName(earlier->second.native())});
             failed = true;
         }
     }
     return kept;
 }
 
-// Converts the jobs on `threads` threads, showing progress; true when all succeeded.
-bool convertAll(const std::vector<Job>& jobs, unsigned threads) {
-    std::vector<std::string> messages(jobs.size());
+// Converts the jobs on up to `threads` threads, showing progress; the exit status.
+int convertAll(const std::vector<Job>& jobs, const core::ConversionOptions& options, unsigned threads) {
+    std::vector<Outcome> outcomes(jobs.size());
     std::atomic<std::size_t> next{0};
     std::atomic<std::size_t> done{0};
     std::atomic<std::uint64_t> written{0};
     const auto work = [&] {
         for (std::size_t i; (i = next.fetch_add(1)) < jobs.size();) {
             std::uint64_t bytes = 0;
-            messages[i] = convertToFile(jobs[i], bytes);
+            outcomes[i] = convertToFile(jobs[i], options, bytes);
             written += bytes;
             ++done;
         }
@@ -240,12 +272,20 @@ bool convertAll(const std::vector<Job>& jobs, unsigned threads) {
     ProgressLine progress(jobs.size());
     {
         std::vector<std::jthread> workers;
-        for (unsigned t = 1; t < threads; ++t) workers.emplace_back(work);
-        if (!progress.shown()) {
+        // When the system gives fewer threads than asked for, those it gave do the work.
+        const auto startWorker = [&] {
+            try {
+                workers.emplace_back(work);
+                return true;
+            } catch (const std::system_error&) {
+                return false;
+            }
+        };
+        for (unsigned t = 1; t < threads && startWorker();) ++t;
+        if (!progress.shown() || (workers.empty() && !startWorker())) {
             work();
         } else {
             // The main thread draws the progress line while the workers convert.
-            if (workers.empty()) workers.emplace_back(work);
             while (done < jobs.size()) {
                 progress.update(done, written);
                 std::this_thread::sleep_for(std::chrono::milliseconds(200));
@@ -254,18 +294,20 @@ bool convertAll(const std::vector<Job>& jobs, unsigned threads) {
     }
     progress.finish(done, written);
 
-    bool allWritten = true;
-    for (const std::string& message : messages)
-        if (!message.empty()) {
-            complain({message});
-            allWritten = false;
+    int status = Success;
+    for (const Outcome& outcome : outcomes)
+        if (outcome.status != Success) {
+            complain({outcome.message});
+            status = worse(status, outcome.status);
         }
-    return allWritten;
+    return status;
 }
 
 // Streams each document to standard output in argument order, in writes of up
-// to a quarter megabyte.
-bool writeAllToStandardOutput(const std::vector<Job>& jobs) {
+// to a quarter megabyte; the exit status. A document that would exceed the
+// output budget ends the output: what was written of it stays, and nothing
+// more follows.
+int writeAllToStandardOutput(const std::vector<Job>& jobs, const core::ConversionOptions& options) {
     constexpr std::size_t kWriteSize = std::size_t{1} << 18;
     StandardOutput out;
     std::string pending;
@@ -280,19 +322,24 @@ bool writeAllToStandardOutput(const std::vector<Job>& jobs) {
     core::CallbackSink toOutput([&](std::string_view piece) {
         if (!outputGone) send(piece);
     });
-    bool ok = true;
+    int status = Success;
     for (const Job& job : jobs) {
         UpToFirstNul cut(toOutput);
         try {
-            core::convert(job.kind, job.file, cut);
+            if (const std::optional<Outcome> failed = incomplete(job, core::convert(job.kind, job.file, cut, options))) {
+                complain({failed->message});
+                status = worse(status, failed->status);
+                if (failed->status == Failed) break;
+            }
         } catch (const std::exception& error) {
-            complain({job.name, ": conversion failed: ", error.what()});
-            ok = false;
+            complain({shownName(job.name), ": conversion failed: ", error.what()});
+            status = Failed;
         }
         if (outputGone) break; // standard output is gone; the other documents have nowhere to go
     }
     if (!pending.empty() && !outputGone) outputGone = !out.write(pending);
-    return out.finish() && ok && !outputGone;
+    if (!out.finish() || outputGone) status = Failed;
+    return status;
 }
 
 } // namespace
@@ -306,8 +353,9 @@ int runXml(Args args) {
     bool rejected = false;
     bool failed = false;
     std::vector<Job> jobs = jobsOf(parsed->files, rejected);
+    int status = Success;
     if (!parsed->outputDir) {
-        failed = !writeAllToStandardOutput(jobs);
+        status = writeAllToStandardOutput(jobs, parsed->options);
     } else {
         std::error_code error;
         fs::create_directories(*parsed->outputDir, error);
@@ -319,9 +367,11 @@ int runXml(Args args) {
         jobs = assignTargets(std::move(jobs), *parsed->outputDir, failed);
         const unsigned threads = std::clamp<std::size_t>(parsed->jobs ? parsed->jobs : coreCount(), 1,
                                                           std::max<std::size_t>(jobs.size(), 1));
-        if (!convertAll(jobs, threads)) failed = true;
+        status = convertAll(jobs, parsed->options, threads);
     }
-    return failed ? Failed : rejected ? Rejected : Success;
+    if (failed) status = worse(status, Failed);
+    if (rejected) status = worse(status, Rejected);
+    return status;
 }
 
 } // namespace dexmor

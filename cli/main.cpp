@@ -6,7 +6,9 @@
 #include "Commands.hpp"
 
 #include <dexmor/version.hpp>
+#include <dexmor/dexmor.hpp>
 
+#include <csignal>
 #include <exception>
 #include <new>
 #include <string_view>
@@ -22,7 +24,7 @@ const std::string_view helpText =
     "XML asset documents.\n"
     "\n"
     "Commands:\n"
-    "  xml [-o DIR] [-j N] FILE...\n"
+    "  xml [-o DIR] [-j N] [--max-output BYTES] FILE...\n"
     "      Converts each FILE by its extension (.zelmat or .zelopt, in any letter\n"
     "      case) and writes the documents to standard output one after the other,\n"
     "      adding nothing between them. A file that is not in the binary format\n"
@@ -37,6 +39,11 @@ const std::string_view helpText =
     "          documents are the same whatever N is. When standard error is a\n"
     "          terminal, a progress line shows the files done, the rate and the\n"
     "          time left.\n"
+    "      --max-output BYTES, --max-output=BYTES\n"
+    "          The output budget: a document that would exceed BYTES is not\n"
+    "          written (with -o its target is left as it was; on standard output\n"
+    "          what was written of it stays and nothing more follows). Default:\n"
+    "          the larger of 256 MiB and 1,000 times the FILE's size; 0: no limit.\n"
     "      --  Takes every later argument as a FILE, even one starting with '-'.\n"
     "\n"
     "      Examples:\n"
@@ -60,8 +67,9 @@ const std::string_view helpText =
     "\n"
     "Exit status:\n"
     "  xml    0 when every document was written; 1 when an output could not be\n"
-    "         written; 2 for wrong usage or a FILE that was not converted (unknown\n"
-    "         extension, missing or not a regular file). The other FILEs are\n"
+    "         written or a document would exceed the output budget; 2 for wrong\n"
+    "         usage or a FILE that was not converted (unknown extension, missing,\n"
+    "         not a regular file, or not readable in full). The other FILEs are\n"
     "         still converted.\n"
     "  check  0 when every FILE reads as binary; 1 when one does not; 2 for wrong\n"
     "         usage or a FILE with an unknown extension.\n"
@@ -98,6 +106,11 @@ int run(Args args) {
 
 int main(int argc, char** argv) {
     using namespace dexmor;
+    // A write beyond the file-size limit then fails with EFBIG and is reported as
+    // any failed write, instead of killing the tool halfway through a batch.
+    std::signal(SIGXFSZ, SIG_IGN);
+    // An interrupted batch leaves whole documents only.
+    OrvexKavorCore::AtomicFileSink::removeTemporariesOnSignals();
     try {
         const std::vector<std::string_view> args(argv + (argc > 0 ? 1 : 0), argv + argc);
         return run(args);

@@ -71,7 +71,7 @@ set(DEXMOR_PUBLIC_HEADERS
   textures/UVWGenerators.hpp
   textures/ZelSequenceDataEnvironment.hpp
   xml/AssetXmlWriter.hpp
-  xml/TextSink.hpp
+  xml/OutputWatch.hpp
   xml/XmlSerializable.hpp
 )
 list(TRANSFORM DEXMOR_PUBLIC_HEADERS PREPEND ${PROJECT_SOURCE_DIR}/include/dexmor/ OUTPUT_VARIABLE DEXMOR_PUBLIC_HEADER_PATHS)

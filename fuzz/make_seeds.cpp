@@ -10,6 +10,8 @@
 //            and the sample in every options version the reader accepts.
 // Every file is read back before it is kept; a form that does not read is left out.
 // The checked-in corpora are these files after libFuzzer's -merge=1.
+#include "HostileShapes.hpp"
+
 #include <dexmor/files/ConversionContext.hpp>
 #include <dexmor/archive/Record.hpp>
 #include <dexmor/files/ZelMatFile.hpp>
@@ -30,6 +32,7 @@
 #include <span>
 #include <sstream>
 #include <string>
+#include <string_view>
 #include <vector>
 
 using namespace OrvexKavorCore;
@@ -165,6 +168,22 @@ void fill(const TexturePtr& texture) {
     if (auto* t = dynamic_cast<FresnelTexture*>(texture.get())) t->black_color_tex = color();
 }
 
+// The oldest version of a diffuse layer, without a name: a handful of bytes.
+BRDFPtr cheapestLayer() {
+    static const auto layer = [] {
+        auto diffuse = boost::make_shared<Diffuse_BRDF>();
+        diffuse->name.clear();
+        return diffuse;
+    }();
+    return boost::make_shared<OlderBRDF<Diffuse_BRDF>>(layer, 1);
+}
+
+void keepHostileShapes() {
+    keepLibrary("lib_amplify_quoted_name_layers", {hostile::amplifier(2000, 40, cheapestLayer)});
+    keepLibrary("lib_deepest_bump_chain", {hostile::deepestChain(hostile::bumpChain)});
+    keepLibrary("lib_deepest_texture_chain", {hostile::deepestChain(hostile::textureChain)});
+}
+
 std::string optionsBytes(AllOptions& options, std::uint16_t version) {
     QuickArchive ar;
     ar.write(VersionWord::make(AllOptions::kVersionFirstHalf, version));
@@ -185,8 +204,16 @@ void keepOptions(const std::string& name, const std::string& bytes) {
 } // namespace
 
 int main(int argc, char** argv) {
+    if (argc == 5 && std::string_view(argv[1]) == "--amplifier") {
+        // make_seeds --amplifier NAME_LENGTH LAYERS FILE: a large hostile library, to measure with.
+        const ConversionContext context;
+        std::ofstream(argv[4], std::ios::binary)
+            << generation2({hostile::amplifier(std::stoul(argv[2]), std::stoul(argv[3]), cheapestLayer)});
+        return 0;
+    }
     if (argc != 3) {
-        std::fprintf(stderr, "usage: make_seeds SAMPLE_DIR OUTPUT_DIR\n");
+        std::fprintf(stderr, "usage: make_seeds SAMPLE_DIR OUTPUT_DIR\n"
+                             "       make_seeds --amplifier NAME_LENGTH LAYERS FILE\n");
         return 2;
     }
     const fs::path samples = argv[1];
@@ -229,6 +256,8 @@ int main(int argc, char** argv) {
         texture->uvwgen = createUVW(kind);
         keepLibrary("lib_uvw_kind" + std::to_string(kind), {diffuseWith(texture)});
     }
+
+    keepHostileShapes();
 
     {
         // Two skies whose stored default suns differ only in the sign of a zero

@@ -16,6 +16,7 @@
 #include <dexmor/version.hpp>
 #include <dexmor/platform/Text.hpp>
 
+#include <chrono>
 #include <cstring>
 #include <exception>
 #include <filesystem>
@@ -23,7 +24,11 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <thread>
 #include <utility>
+
+#include <sys/syscall.h>
+#include <unistd.h>
 
 namespace {
 
@@ -65,11 +70,17 @@ void raiseModuleError(const char* message) noexcept {
     Py_DECREF(text);
 }
 
+// Thrown when a signal handler raised an exception during a call: the
+// interpreter holds that exception already.
+struct Interrupted {};
+
 // Turns a C++ exception into the matching Python exception. The interpreter
 // lock must be held.
 void raiseFromCxx(std::exception_ptr failure) noexcept {
     try {
         std::rethrow_exception(std::move(failure));
+    } catch (const Interrupted&) {
+        // KeyboardInterrupt (or what the handler raised) is set already.
     } catch (const std::bad_alloc&) {
         PyErr_NoMemory();
     } catch (const std::exception& error) {
@@ -142,18 +153,52 @@ std::optional<FileArgument> fileArgument(PyObject* args, const Call& call) {
     return std::nullopt;
 }
 
+// A document in a string whose conversion stops when a signal handler raises:
+// between pieces it runs the pending handlers (Ctrl-C's KeyboardInterrupt),
+// taking the interpreter lock only for that. Handlers run on the main thread
+// only, so only a call there looks, and at most ten times a second: the lock
+// may have to wait for other threads.
+class InterruptibleText final : public core::StringSink {
+public:
+    explicit InterruptibleText(std::string& text) : StringSink(text), thread_(std::this_thread::get_id()) {}
+
+    // The thread state the lock was released from, while it is released.
+    void lockReleasedBy(PyThreadState* state) { released_ = state; }
+
+    void checkpoint() override {
+        // A deep conversion runs on a thread of its own, where the lock cannot be taken for this thread.
+        if (!released_ || !onMainThread() || std::this_thread::get_id() != thread_) return;
+        const auto now = std::chrono::steady_clock::now();
+        if (now < nextLook_) return;
+        nextLook_ = now + std::chrono::milliseconds(100);
+        PyEval_RestoreThread(released_);
+        const bool raised = PyErr_CheckSignals() != 0;
+        released_ = PyEval_SaveThread();
+        if (raised) throw Interrupted{};
+    }
+
+private:
+    static bool onMainThread() { return ::getpid() == static_cast<pid_t>(::syscall(SYS_gettid)); }
+
+    std::thread::id thread_;
+    PyThreadState* released_ = nullptr;
+    std::chrono::steady_clock::time_point nextLook_ = std::chrono::steady_clock::now() + std::chrono::milliseconds(100);
+};
+
 // Runs `work` with the interpreter lock released; its exception, if any, is
-// thrown again once the lock is held.
+// thrown again once the lock is held. A given sink may look for signals meanwhile.
 template <class Work>
-void withoutInterpreterLock(Work&& work) {
+void withoutInterpreterLock(Work&& work, InterruptibleText* sink = nullptr) {
     std::exception_ptr failure;
-    Py_BEGIN_ALLOW_THREADS
+    PyThreadState* state = PyEval_SaveThread();
+    if (sink) sink->lockReleasedBy(state);
     try {
         work();
     } catch (...) {
         failure = std::current_exception();
     }
-    Py_END_ALLOW_THREADS
+    if (sink) sink->lockReleasedBy(nullptr);
+    PyEval_RestoreThread(state);
     if (failure) std::rethrow_exception(failure);
 }
 
@@ -166,26 +211,39 @@ PyObject* textObject(std::string_view text) {
 PyObject* convertFile(PyObject* args, const Call& call) {
     std::optional<FileArgument> file = fileArgument(args, call);
     if (!file) return nullptr;
-    // Each thread keeps its text buffer between calls, so converting many files
-    // does not map, fault in and unmap fresh memory for every document; the
-    // buffer of a very large document is let go.
-    constexpr std::size_t kKeptCapacity = std::size_t{64} << 20;
+    // Each thread keeps a small text buffer between calls, so converting many
+    // small files does not map, fault in and unmap fresh memory for each; the
+    // buffer of a larger document is let go, so that a pool of idle threads
+    // holds a few MiB each at most.
+    constexpr std::size_t kKeptCapacity = std::size_t{4} << 20;
     thread_local std::string xml;
     xml.clear();
+    struct LetGoOfLargeBuffer {
+        ~LetGoOfLargeBuffer() {
+            if (xml.capacity() > kKeptCapacity) std::string().swap(xml);
+        }
+    } letGo;
     // Only making the str object needs the lock: the conversion, measuring the
     // text and filling in the characters run while other threads do.
     std::string_view text;
     std::optional<python::StrShape> shape;
-    withoutInterpreterLock([&] {
-        core::StringSink sink(xml);
-        core::convert(file->kind, std::filesystem::path(std::move(file->path)), sink);
-        text = core::text::upToFirstNul(xml);
-        shape = python::measureUtf8(text);
-    });
-    PyObject* result = shape ? python::newStr(*shape) : textObject(text);
-    if (result && shape) withoutInterpreterLock([&] { python::fillStr(result, text); });
-    if (xml.capacity() > kKeptCapacity) std::string().swap(xml);
-    return result;
+    core::Diagnosis result;
+    InterruptibleText sink(xml);
+    withoutInterpreterLock(
+        [&] {
+            result = core::convert(file->kind, std::filesystem::path(file->path), sink);
+            text = core::text::upToFirstNul(xml);
+            shape = python::measureUtf8(text);
+        },
+        &sink);
+    if (result.exceededBudget) {
+        raiseModuleError((file->path + ": the XML would exceed " + std::to_string(*result.exceededBudget) +
+                          " bytes (the output budget)").c_str());
+        return nullptr;
+    }
+    PyObject* str = shape ? python::newStr(*shape) : textObject(text);
+    if (str && shape) withoutInterpreterLock([&] { python::fillStr(str, text); });
+    return str;
 }
 
 PyObject* diagnoseFile(PyObject* args, const Call& call) {

@@ -7,9 +7,13 @@
 
 #include "files/LibraryConversion.hpp"
 #include "files/OptionsConversion.hpp"
+#include "files/SinkWriter.hpp"
 #include "platform/FileIo.hpp"
 #include "platform/HugePages.hpp"
+#include "platform/Stack.hpp"
 
+#include <algorithm>
+#include <limits>
 #include <new>
 
 namespace OrvexKavorCore {
@@ -31,7 +35,8 @@ std::optional<FileKind> fileKindOf(std::string_view path) {
 }
 
 std::string Diagnosis::reason() const {
-    if (!opened) return "the file cannot be opened";
+    if (!opened) return "the file " + (failure ? failure->reason : std::string("cannot be opened"));
+    if (exceededBudget) return "the XML would exceed " + std::to_string(*exceededBudget) + " bytes (the output budget)";
     return failure ? failure->describe() : std::string("no reason was recorded");
 }
 
@@ -61,59 +66,119 @@ void AtomicFileSink::takeBack() {
 
 bool AtomicFileSink::commit(std::string* error) { return file_->commit(error); }
 
+void AtomicFileSink::removeTemporariesOnSignals() { OrvexKavorCore::removeTemporariesOnSignals(); }
+
 // --- conversion ---
 
 namespace {
 
+// Bytes an archive cannot hold: a file larger than this, whatever its kind, does
+// not read as binary, and only its text up to the first NUL is read.
+constexpr std::uint64_t kLargestBinaryFile = QuickArchive::kMaxSize + 12;
+
+// Stack a conversion may need: records nest up to the reader's limit, and each
+// level costs the reading and the writing a few frames. Measured at about a
+// third of this for the deepest chain of every nested kind; sanitizer builds
+// use several times the frame sizes.
+#if defined(__SANITIZE_ADDRESS__)
+constexpr std::size_t kConversionStack = std::size_t{64} << 20;
+#elif defined(__has_feature)
+#if __has_feature(address_sanitizer)
+constexpr std::size_t kConversionStack = std::size_t{64} << 20;
+#else
+constexpr std::size_t kConversionStack = std::size_t{4} << 20;
+#endif
+#else
+constexpr std::size_t kConversionStack = std::size_t{4} << 20;
+#endif
+
+struct InputBytes {
+    SharedBytes bytes;
+    bool overLimit = false; // the bytes are only the text of a file too large to read as binary
+};
+
 // The bytes of the input: a file read once, or the caller's bytes viewed in place.
-std::optional<SharedBytes> bytesOf(const Input& input) {
-    if (const std::string_view* bytes = input.bytes()) return SharedBytes({}, *bytes);
-    return readRegularFile(*input.path());
+std::optional<InputBytes> bytesOf(const Input& input, std::string& error) {
+    if (const std::string_view* bytes = input.bytes()) {
+        if (bytes->size() <= kLargestBinaryFile) return InputBytes{SharedBytes({}, *bytes), false};
+        return InputBytes{SharedBytes({}, text::upToFirstNul(*bytes)), true};
+    }
+    std::optional<FileContent> content = readRegularFile(*input.path(), &error, kLargestBinaryFile);
+    if (!content) return std::nullopt;
+    return InputBytes{std::move(content->bytes), content->overLimit};
 }
 
-Diagnosis unopened() {
+Diagnosis unopened(std::string why) {
     Diagnosis result;
-    result.failure = ReadFailure{"the file cannot be opened", 0, {}};
+    result.failure = ReadFailure{std::move(why), 0, {}};
     return result;
 }
 
-// The length of the pass-through text: the bytes taken to be XML text already,
-// up to the first NUL.
+Diagnosis tooLargeForAnArchive() {
+    Diagnosis result;
+    result.failure = ReadFailure{"the file is larger than the 4 GiB an archive can hold", 0, "header"};
+    return result;
+}
+
+// The pass-through text: the bytes taken to be XML text already, up to the first NUL.
 std::string passThroughText(const SharedBytes& bytes) {
     return text::decodeStoredText(text::upToFirstNul(bytes.view()));
 }
 
-template <class Read>
-Diagnosis withFileKind(FileKind kind, const Input& input, Read read) {
-    const std::optional<SharedBytes> bytes = bytesOf(input);
-    if (!bytes) return unopened();
-    ConversionContext context;
-    Diagnosis result = kind == FileKind::MaterialLibrary ? read(LibraryConversion(context, *bytes), *bytes)
-                                                         : read(OptionsConversion(*bytes), *bytes);
-    result.opened = true;
+// Hands the conversion of `bytes` as a file of `kind` to `use`, on a stack deep
+// enough for any nesting the readers accept.
+template <class Use>
+Diagnosis withConversion(FileKind kind, const InputBytes& input, std::uint64_t budget, Use use) {
+    if (input.overLimit) return tooLargeForAnArchive();
+    Diagnosis result;
+    runWithStack(kConversionStack, [&] {
+        ConversionContext context;
+        result = kind == FileKind::MaterialLibrary ? use(LibraryConversion(context, input.bytes, budget))
+                                                   : use(OptionsConversion(input.bytes, budget));
+    });
     return result;
 }
 
 } // namespace
 
-Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink) {
-    return withFileKind(kind, input, [&sink](auto&& conversion, const SharedBytes& bytes) {
-        Diagnosis result = conversion.writeTo(sink);
+std::uint64_t ConversionOptions::outputBudgetFor(std::uint64_t inputSize) const {
+    if (maxOutput) return *maxOutput;
+    constexpr std::uint64_t kFloor = std::uint64_t{256} << 20;
+    constexpr std::uint64_t kTimesInput = 1000;
+    const std::uint64_t most = std::numeric_limits<std::uint64_t>::max();
+    return std::max(kFloor, inputSize > most / kTimesInput ? most : inputSize * kTimesInput);
+}
+
+Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink, const ConversionOptions& options) {
+    std::string error;
+    const std::optional<InputBytes> bytes = bytesOf(input, error);
+    if (!bytes) return unopened(std::move(error));
+    const std::uint64_t budget = options.outputBudgetFor(bytes->bytes.size());
+    Diagnosis result;
+    try {
+        result = withConversion(kind, *bytes, budget, [&sink](auto&& conversion) { return conversion.writeTo(sink); });
         if (!result.readsAsBinary) {
-            const std::string text = passThroughText(bytes);
+            const std::string text = passThroughText(bytes->bytes);
+            if (budget != 0 && text.size() > budget) throw OutputBudgetExceeded{budget};
             result.fallbackLength = text.size();
             sink.write(text);
         }
-        return result;
-    });
+    } catch (const OutputBudgetExceeded& exceeded) {
+        if (sink.canTakeBack()) sink.takeBack();
+        result.exceededBudget = exceeded.budget;
+    }
+    result.opened = true;
+    return result;
 }
 
 Diagnosis diagnose(FileKind kind, const Input& input) {
-    return withFileKind(kind, input, [](auto&& conversion, const SharedBytes& bytes) {
-        Diagnosis result = conversion.readThrough();
-        if (!result.readsAsBinary) result.fallbackLength = passThroughText(bytes).size();
-        return result;
-    });
+    std::string error;
+    const std::optional<InputBytes> bytes = bytesOf(input, error);
+    if (!bytes) return unopened(std::move(error));
+    Diagnosis result = withConversion(kind, *bytes, 0, [](auto&& conversion) { return conversion.readThrough(); });
+    if (!result.readsAsBinary) result.fallbackLength = passThroughText(bytes->bytes).size();
+    result.opened = true;
+    return result;
 }
 
 } // namespace OrvexKavorCore

@@ -99,7 +99,7 @@ Diagnosis LibraryConversion::writeTo(DocumentSink& sink) {
 
 LibraryConversion::SingleReading LibraryConversion::writeReadingOnce(DocumentSink& sink, Diagnosis& result) {
     sink.expect(std::min(bytes_.size() * kExpectedGrowth, kMostExpectedAtOnce));
-    SinkWriter out(sink);
+    SinkWriter out(sink, budget_);
     DefaultSunWatch sunWatch;
     const bool read = readMaterials(result, [&](MaterialPtr&& material) {
         if (sunWatch.changedAfterReading()) return; // the text is written again by two readings
@@ -121,7 +121,7 @@ void LibraryConversion::writeReadingTwice(DocumentSink& sink, Diagnosis& result)
     const SunLight finalSun = defaultSun;
     defaultSun = pristineSun;
 
-    SinkWriter out(sink);
+    SinkWriter out(sink, budget_);
     readMaterials(result, [&](MaterialPtr&& material) {
         defaultSun = finalSun;
         writeMaterialAssets(out.writer(), material);

@@ -5,16 +5,21 @@
 #include <dexmor/files/ConversionContext.hpp>
 #include <dexmor/files/ZelMatFile.hpp>
 
+#include <cstdint>
+
 namespace OrvexKavorCore {
 
 class LibraryConversion {
 public:
-    LibraryConversion(ConversionContext& context, const SharedBytes& bytes) : context_(context), bytes_(bytes) {}
+    // `budget`: the most bytes the document may have (0: no limit).
+    LibraryConversion(ConversionContext& context, const SharedBytes& bytes, std::uint64_t budget = 0)
+        : context_(context), bytes_(bytes), budget_(budget) {}
 
     // Reads every material, each dropped as soon as it has read.
     Diagnosis readThrough();
     // Writes the document to `sink`; when the bytes do not read as a library,
-    // nothing stays in the sink and the result says why.
+    // nothing stays in the sink and the result says why. Throws
+    // OutputBudgetExceeded when the document would exceed the budget.
     Diagnosis writeTo(DocumentSink& sink);
 
 private:
@@ -34,6 +39,7 @@ private:
 
     ConversionContext& context_;
     const SharedBytes& bytes_;
+    std::uint64_t budget_;
 };
 
 } // namespace OrvexKavorCore

@@ -3,23 +3,28 @@
 #include <dexmor/dexmor.hpp>
 #include <dexmor/platform/SharedBytes.hpp>
 
+#include <cstdint>
+
 namespace OrvexKavorCore {
 
 class AllOptions;
 
 class OptionsConversion {
 public:
-    explicit OptionsConversion(const SharedBytes& bytes) : bytes_(bytes) {}
+    // `budget`: the most bytes the document may have (0: no limit).
+    explicit OptionsConversion(const SharedBytes& bytes, std::uint64_t budget = 0) : bytes_(bytes), budget_(budget) {}
 
     Diagnosis readThrough();
     // Writes the document to `sink`; nothing when the bytes do not read as an
-    // options file (the result then says why).
+    // options file (the result then says why). Throws OutputBudgetExceeded when
+    // the document would exceed the budget.
     Diagnosis writeTo(DocumentSink& sink);
 
 private:
     bool read(AllOptions& options, Diagnosis& result);
 
     const SharedBytes& bytes_;
+    std::uint64_t budget_;
 };
 
 } // namespace OrvexKavorCore

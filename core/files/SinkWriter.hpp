@@ -1,39 +1,48 @@
 #pragma once
 // An asset writer whose text goes to a DocumentSink: straight into the sink's
 // string when the sink holds the whole document there, else in pieces of about
-// kPieceSize bytes as it is written.
+// kPieceSize bytes as it is written. Either way the sink's checkpoint is called
+// between pieces, and the document is held to the output budget as it grows.
 #include <dexmor/dexmor.hpp>
 #include <dexmor/xml/AssetXmlWriter.hpp>
 
+#include <cstdint>
 #include <string>
 
 namespace OrvexKavorCore {
 
-class SinkWriter {
+// Thrown when a document would exceed its output budget; convert() reports it.
+struct OutputBudgetExceeded {
+    std::uint64_t budget;
+};
+
+class SinkWriter final : private OutputWatch {
 public:
     static constexpr std::size_t kPieceSize = 64 * 1024;
 
-    explicit SinkWriter(DocumentSink& sink)
-        : whole_(sink.wholeText()), send_([&sink](std::string_view piece) { sink.write(piece); }),
-          writer_(whole_ ? *whole_ : pieces_) {
-        if (!whole_) writer_.streamTo(&send_, kPieceSize);
-    }
+    // `budget`: the most bytes the document may have; 0 for no limit.
+    SinkWriter(DocumentSink& sink, std::uint64_t budget);
     SinkWriter(const SinkWriter&) = delete;
     SinkWriter& operator=(const SinkWriter&) = delete;
 
     AssetXmlWriter& writer() { return writer_; }
 
-    // Sends what is still held back.
-    void finish() {
-        if (whole_) return;
-        writer_.streamTo(nullptr, 0);
-        if (!pieces_.empty()) send_(pieces_);
-        pieces_.clear();
-    }
+    // Sends what is still held back. Throws OutputBudgetExceeded when the whole
+    // document exceeds the budget.
+    void finish();
 
 private:
+    std::size_t grown(std::string& output) override;
+    // Throws when `size` bytes of document exceed the budget.
+    void spend(std::uint64_t size) const {
+        if (budget_ != 0 && size > budget_) throw OutputBudgetExceeded{budget_};
+    }
+
+    DocumentSink& sink_;
+    std::uint64_t budget_;
     std::string* whole_;
-    TextSink send_;
+    std::size_t wholeStart_ = 0; // where this document starts in *whole_
+    std::uint64_t sent_ = 0;     // bytes sent as pieces
     std::string pieces_;
     AssetXmlWriter writer_;
 };

@@ -219,16 +219,21 @@ bool ZelMatFile::save(const std::filesystem::path& path) {
 }
 
 std::ios_base::openmode ZelMatFile::probeOpenMode(const std::filesystem::path& path) {
-    const std::optional<SharedBytes> bytes = readRegularFile(path);
-    if (!bytes) return std::ios_base::in;
-    if (bytes->size() >= 4 && VersionWord{readLittleEndian32(bytes->data())}.is(0, 1)) return std::ios_base::in;
+    const std::optional<FileContent> content = readRegularFile(path);
+    if (!content) return std::ios_base::in;
+    const SharedBytes& bytes = content->bytes;
+    if (bytes.size() >= 4 && VersionWord{readLittleEndian32(bytes.data())}.is(0, 1)) return std::ios_base::in;
     return std::ios_base::in | std::ios_base::binary;
 }
 
 std::optional<SharedBytes> ZelMatFile::readFile(const std::filesystem::path& path) {
-    std::optional<SharedBytes> bytes = readRegularFile(path);
-    if (!bytes) lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
-    return bytes;
+    std::string error;
+    std::optional<FileContent> content = readRegularFile(path, &error);
+    if (!content) {
+        lastReadFailure_ = ReadFailure{"the file " + error, 0, {}};
+        return std::nullopt;
+    }
+    return std::move(content->bytes);
 }
 
 std::string ZelMatFile::toXml(const MaterialPtr& material) {

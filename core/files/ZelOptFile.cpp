@@ -18,12 +18,13 @@ bool ZelOptFile::writeFile(OrvexSerializable& object, const std::filesystem::pat
 
 bool ZelOptFile::readFile(OrvexSerializable& object, const std::filesystem::path& path) {
     lastReadFailure_.reset();
-    const std::optional<SharedBytes> bytes = readRegularFile(path);
-    if (!bytes) {
-        lastReadFailure_ = ReadFailure{"the file cannot be opened", 0, {}};
+    std::string error;
+    const std::optional<FileContent> content = readRegularFile(path, &error);
+    if (!content) {
+        lastReadFailure_ = ReadFailure{"the file " + error, 0, {}};
         return false;
     }
-    return readBytes(object, bytes->view());
+    return readBytes(object, content->bytes.view());
 }
 
 bool ZelOptFile::readBytes(OrvexSerializable& object, std::string_view bytes) {

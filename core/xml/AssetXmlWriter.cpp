@@ -73,19 +73,14 @@ void AssetXmlWriter::flush() {
     reserveForAppend(out_, pendingSize_);
     out_.append(pending_, pendingSize_);
     pendingSize_ = 0;
-    if (stream_ && out_.size() >= pieceSize_) sendPiece();
+    checkGrowth();
 }
 
-void AssetXmlWriter::sendPiece() {
-    (*stream_)(out_);
-    out_.clear();
-}
-
-void AssetXmlWriter::streamTo(const TextSink* sink, std::size_t pieceSize) {
+void AssetXmlWriter::watchOutput(OutputWatch* watch, std::size_t threshold) {
     flush();
-    stream_ = sink;
-    pieceSize_ = pieceSize;
-    if (stream_ && !out_.empty()) sendPiece();
+    watch_ = watch;
+    watchAt_ = watch ? threshold : kUnwatched;
+    if (watch_) checkGrowth();
 }
 
 void AssetXmlWriter::putLong(std::string_view text) {
@@ -110,7 +105,7 @@ void AssetXmlWriter::putNarrow(std::string_view narrow) {
         text::appendLatin1AsUtf8(out_, run);
         narrow.remove_prefix(run.size());
     }
-    if (stream_ && out_.size() >= pieceSize_) sendPiece();
+    checkGrowth();
 }
 
 template <bool kAllEntities, bool kNarrow>

@@ -10,11 +10,13 @@
 // A file that reads as a binary file of its kind gives its XML document; any
 // other file is taken to be XML text already and gives its own bytes up to the
 // first NUL (strict UTF-8, else Windows-1252), and the result says why it did
-// not read; a file that cannot be opened gives nothing.
+// not read; a file that cannot be opened or read in full gives nothing, and the
+// result says so.
 #include <dexmor/archive/ReadFailure.hpp>
 #include <dexmor/version.hpp>
 
 #include <cstddef>
+#include <cstdint>
 #include <filesystem>
 #include <functional>
 #include <memory>
@@ -73,10 +75,14 @@ public:
     // The string that holds the whole document, for a sink that has one: the
     // conversion then writes into it directly instead of sending pieces.
     virtual std::string* wholeText() { return nullptr; }
+    // Called between pieces of the document (about every 64 KiB of text, whether
+    // or not the sink has a wholeText()). A sink may throw from here to stop the
+    // conversion, say on a pending interrupt; the exception leaves convert().
+    virtual void checkpoint() {}
 };
 
 // Appends the document to a string.
-class StringSink final : public DocumentSink {
+class StringSink : public DocumentSink {
 public:
     explicit StringSink(std::string& document) : document_(document), start_(document.size()) {}
     void write(std::string_view piece) override { document_.append(piece); }
@@ -102,9 +108,10 @@ private:
 
 class AtomicFileWriter;
 
-// Writes the document to a temporary file beside `target` and puts it in place
-// with commit(); without a successful commit the target is left as it was and the
-// temporary removed.
+// Writes the document to a file that takes the place of `target` with commit():
+// until then it is an unnamed file where the file system has them (nothing is
+// left behind even when the process is killed), else a temporary file beside the
+// target. Without a successful commit the target is left as it was.
 class AtomicFileSink final : public DocumentSink {
 public:
     explicit AtomicFileSink(std::filesystem::path target);
@@ -116,6 +123,11 @@ public:
     // close or the rename failed.
     bool commit(std::string* error = nullptr);
     std::size_t bytesWritten() const { return written_; }
+
+    // For a program that owns its signals (a command-line tool): installs handlers
+    // for SIGINT, SIGTERM and SIGHUP that remove the temporary files of unfinished
+    // sinks, then end the process as the signal would have.
+    static void removeTemporariesOnSignals();
 
 private:
     std::unique_ptr<AtomicFileWriter> file_;
@@ -133,15 +145,37 @@ struct Diagnosis {
     // (UTF-8) of the pass-through text written instead.
     std::optional<ReadFailure> failure;
     std::size_t fallbackLength = 0;
+    // Set when the XML would have exceeded the output budget of this many bytes:
+    // the conversion stopped there, and what the sink received is no document (a
+    // sink that can take its text back has dropped it).
+    std::optional<std::uint64_t> exceededBudget;
+
+    // Whether the sink received a whole document: the XML or the pass-through text.
+    bool complete() const { return opened && !exceededBudget; }
 
     // Why the file does not read as binary, for a user: the failure with its record
-    // path and offset, or that the file cannot be opened.
+    // path and offset, why the file cannot be opened or read, or the budget the XML
+    // would have exceeded.
     std::string reason() const;
 };
 
+struct ConversionOptions {
+    // The output budget: the most bytes a document may have. nullopt: the larger
+    // of 256 MiB and 1,000 times the input's size (a legitimate library gives some
+    // twenty times its size; a hostile one can ask for far more than that: its
+    // names are repeated in every url beneath them). 0: no limit.
+    std::optional<std::uint64_t> maxOutput;
+
+    // The budget for an input of `inputSize` bytes; 0 for none.
+    std::uint64_t outputBudgetFor(std::uint64_t inputSize) const;
+};
+
 // Converts `input` as a file of `kind` into `sink`. Never throws for any input
-// (only what the sink itself throws, or std::bad_alloc, leaves it).
-Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink);
+// (only what the sink itself throws, std::bad_alloc, or std::system_error when
+// no thread can be had for a deep conversion, leaves it). Any depth of
+// nesting the reader accepts converts on any thread: a conversion that finds too
+// little stack left on the calling thread runs on a thread of its own.
+Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink, const ConversionOptions& options = {});
 // What convert() would find, without writing the document.
 Diagnosis diagnose(FileKind kind, const Input& input);
 

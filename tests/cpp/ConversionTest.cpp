@@ -205,7 +205,7 @@ TEST_F(Conversions, DiagnosisSaysWhatAFileHoldsOrWhyItDidNotRead) {
     EXPECT_FALSE(missing.opened);
     EXPECT_EQ(missing.fallbackLength, 0u);
     ASSERT_TRUE(missing.failure);
-    EXPECT_EQ(missing.failure->reason, "the file cannot be opened");
+    EXPECT_EQ(missing.reason(), "the file cannot be opened: No such file or directory");
 }
 
 } // namespace

@@ -32,7 +32,7 @@ def test_diagnose_gives_none_or_the_reason(files):
     assert Dexmor.diagnose(str(files["options"])) is None
     assert Dexmor.diagnose(files["damaged"]) == "material 0: unknown material kind 41 at offset 16"
     assert Dexmor.diagnose(files["text"]).startswith("unknown options version")
-    assert Dexmor.diagnose(files["missing"]) == "the file cannot be opened"
+    assert Dexmor.diagnose(files["missing"]) == "the file cannot be opened: No such file or directory"
     with pytest.raises(Dexmor.error, match=r"\.zelmat.*\.zelopt"):
         Dexmor.diagnose(files["library"].with_suffix(".txt"))
     with pytest.raises(TypeError):
@@ -51,7 +51,7 @@ def test_check_prints_one_line_per_file(files):
         " the conversion returns the empty text",
         f"{files['text']}: not readable as binary: {Dexmor.diagnose(files['text'])};"
         " the conversion returns the file's text (9 bytes)",
-        f"{files['missing']}: not readable as binary: the file cannot be opened;"
+        f"{files['missing']}: not readable as binary: the file cannot be opened: No such file or directory;"
         " the conversion returns the empty text",
     ]
 

@@ -22,7 +22,7 @@
 //     </Asset>
 //   </Assets>
 #include <dexmor/platform/KavorTypes.hpp>
-#include <dexmor/xml/TextSink.hpp>
+#include <dexmor/xml/OutputWatch.hpp>
 
 #include <boost/shared_ptr.hpp>
 
@@ -48,11 +48,12 @@ public:
 
     std::string& output() { return out_; }
 
-    // Streams the text: once the output holds `pieceSize` bytes or more, it is
-    // sent to `sink` and the output starts empty again (what it holds now is sent
-    // at once). The sink must outlive the writer's use; nullptr stops streaming,
-    // and the text then stays in the output.
-    void streamTo(const TextSink* sink, std::size_t pieceSize);
+    // Hands the output to `watch` whenever it holds `threshold` bytes or more, and
+    // then at the threshold the watch returns (checked whenever pending text is
+    // added, every few kilobytes; a watch that sends the text on keeps the output
+    // near the threshold however large the document). The watch must outlive the
+    // writer's use; nullptr stops watching.
+    void watchOutput(OutputWatch* watch, std::size_t threshold);
     std::uint32_t depth() const { return depth_; }
 
     // --- document framing ---
@@ -181,7 +182,9 @@ private:
     }
     void advance(char* end) { pendingSize_ = static_cast<std::size_t>(end - pending_); }
     void flush();
-    void sendPiece();
+    void checkGrowth() {
+        if (out_.size() >= watchAt_) watchAt_ = watch_->grown(out_);
+    }
 
     // Two spaces per level. Up to 32 levels, a fixed run of spaces is stored and
     // only the indentation kept, which needs no loop and no call.
@@ -217,8 +220,9 @@ private:
     char pending_[kPendingSize];
     std::size_t pendingSize_ = 0;
     std::uint32_t depth_ = 0;
-    const TextSink* stream_ = nullptr;
-    std::size_t pieceSize_ = 0;
+    OutputWatch* watch_ = nullptr;
+    std::size_t watchAt_ = kUnwatched;
+    static constexpr std::size_t kUnwatched = ~std::size_t{0};
 };
 
 } // namespace OrvexKavorCore

@@ -1,0 +1,73 @@
+#include "platform/TemporaryRegistry.hpp"
+
+#include <array>
+#include <atomic>
+#include <climits>
+#include <csignal>
+#include <cstring>
+#include <mutex>
+
+#include <unistd.h>
+
+namespace OrvexKavorCore::temporaries {
+
+namespace {
+
+enum SlotState : int { kFree, kFilling, kEntered };
+
+struct Slot {
+    std::atomic<int> state{kFree};
+    char path[PATH_MAX];
+};
+
+// As many temporaries as the tool has threads at most; a conversion beyond that
+// simply is not cleaned up on a signal.
+constexpr std::size_t kSlots = 1024;
+std::array<Slot, kSlots> slots;
+
+constexpr int kSignals[] = {SIGINT, SIGTERM, SIGHUP};
+
+void removeAllAndDie(int signal) {
+    for (Slot& slot : slots)
+        if (slot.state.load(std::memory_order_acquire) == kEntered) ::unlink(slot.path);
+    // The handler was installed to run once: the signal now takes its default
+    // action, which ends the process with the status the parent expects.
+    ::raise(signal);
+}
+
+} // namespace
+
+int enter(std::string_view path) {
+    if (path.size() >= PATH_MAX) return -1;
+    for (std::size_t i = 0; i < kSlots; ++i) {
+        int expected = kFree;
+        if (!slots[i].state.compare_exchange_strong(expected, kFilling, std::memory_order_acquire)) continue;
+        std::memcpy(slots[i].path, path.data(), path.size());
+        slots[i].path[path.size()] = '\0';
+        slots[i].state.store(kEntered, std::memory_order_release);
+        return static_cast<int>(i);
+    }
+    return -1;
+}
+
+void leave(int slot) {
+    if (slot >= 0) slots[static_cast<std::size_t>(slot)].state.store(kFree, std::memory_order_release);
+}
+
+void removeOnSignals() {
+    static std::once_flag installed;
+    std::call_once(installed, [] {
+        struct sigaction action {};
+        action.sa_handler = removeAllAndDie;
+        action.sa_flags = SA_RESETHAND | SA_NODEFER;
+        sigemptyset(&action.sa_mask);
+        for (int signal : kSignals) {
+            struct sigaction previous {};
+            // A signal the parent set to be ignored (nohup) stays ignored.
+            if (::sigaction(signal, nullptr, &previous) == 0 && previous.sa_handler == SIG_IGN) continue;
+            ::sigaction(signal, &action, nullptr);
+        }
+    });
+}
+
+} // namespace OrvexKavorCore::temporaries

@@ -1,0 +1,16 @@
+#pragma once
+// The names of temporary files that a signal handler may remove: a fixed table,
+// so that the handler neither allocates nor follows a pointer a thread may free.
+#include <string_view>
+
+namespace OrvexKavorCore::temporaries {
+
+// Enters a path; returns its slot, or -1 when the table is full or the path too long.
+int enter(std::string_view path);
+// Takes the path of `slot` out again (-1: nothing).
+void leave(int slot);
+// Installs, once, handlers for SIGINT, SIGTERM and SIGHUP that remove every entered
+// path and then let the signal end the process.
+void removeOnSignals();
+
+} // namespace OrvexKavorCore::temporaries
