@@ -134,8 +134,11 @@ AtomicFileWriter::AtomicFileWriter(std::filesystem::path target) : target_(std::
     if (fd_ >= 0) return;
     // The file system has no unnamed files: a named temporary, removed on signals.
     temporary_ = temporaryPattern(target_).string();
-    registration_ = temporaries::enter(temporary_);
-    fd_ = ::mkstemp(temporary_.data());
+    const temporaries::NamingWindow window;
+    if (window.ok()) {
+        registration_ = temporaries::enter(temporary_);
+        fd_ = ::mkstemp(temporary_.data());
+    }
     if (fd_ < 0) {
         failWith("cannot create a temporary file beside " + target_.string());
         temporaries::leave(std::exchange(registration_, -1));
@@ -220,6 +223,11 @@ bool AtomicFileWriter::commit(std::string* error) {
     if (error_.empty() && flush()) {
         const bool synced = ::fsync(fd_) == 0;
         if (!synced) failWith("cannot finish writing " + target_.string());
+        const temporaries::NamingWindow window;
+        if (!window.ok()) {
+            errno = EINTR;
+            failWith("cannot put " + target_.string() + " in place");
+        }
         if (error_.empty() && unnamed_) nameUnnamedFile();
         const int fd = std::exchange(fd_, -1);
         if (::close(fd) != 0 && error_.empty()) failWith("cannot finish writing " + target_.string());
@@ -231,10 +239,12 @@ bool AtomicFileWriter::commit(std::string* error) {
                 ::umask(mask);
                 ::chmod(temporary_.c_str(), 0666 & ~mask);
             }
-            if (::rename(temporary_.c_str(), target_.c_str()) == 0)
+            if (::rename(temporary_.c_str(), target_.c_str()) == 0) {
                 committed_ = true;
-            else
+                temporaries::leave(std::exchange(registration_, -1));
+            } else {
                 failWith("cannot replace " + target_.string());
+            }
         }
     }
     if (!committed_ && error) *error = error_;

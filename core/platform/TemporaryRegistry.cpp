@@ -5,6 +5,7 @@
 #include <climits>
 #include <csignal>
 #include <cstring>
+#include <ctime>
 #include <mutex>
 
 #include <unistd.h>
@@ -27,7 +28,17 @@ std::array<Slot, kSlots> slots;
 
 constexpr int kSignals[] = {SIGINT, SIGTERM, SIGHUP};
 
+std::atomic<bool> ending{false};
+std::atomic<int> namingSteps{0};
+
 void removeAllAndDie(int signal) {
+    ending.store(true);
+    // Naming steps under way finish (each takes microseconds); one on this very
+    // thread, interrupted by the signal, never does, hence the bound.
+    for (int waited = 0; namingSteps.load() > 0 && waited < 1000; ++waited) {
+        const timespec millisecond{0, 1000000};
+        ::nanosleep(&millisecond, nullptr);
+    }
     for (Slot& slot : slots)
         if (slot.state.load(std::memory_order_acquire) == kEntered) ::unlink(slot.path);
     // The handler was installed to run once: the signal now takes its default
@@ -53,6 +64,13 @@ int enter(std::string_view path) {
 void leave(int slot) {
     if (slot >= 0) slots[static_cast<std::size_t>(slot)].state.store(kFree, std::memory_order_release);
 }
+
+NamingWindow::NamingWindow() {
+    namingSteps.fetch_add(1);
+    ok_ = !ending.load();
+}
+
+NamingWindow::~NamingWindow() { namingSteps.fetch_sub(1); }
 
 void removeOnSignals() {
     static std::once_flag installed;
