@@ -4,8 +4,12 @@ Each call takes the path of one stored file and returns text. A file that reads
 as a binary file of its kind gives its XML asset document. Any other file is
 taken to be XML text already and comes back as it stands: its bytes up to the
 first NUL byte, decoded as UTF-8, or as Windows-1252 when they are not UTF-8. A
-file that cannot be opened (missing, unreadable, a directory, a FIFO) gives the
-empty string. `diagnose` tells which of these a file is, and why.
+file that cannot be opened or read in full (missing, unreadable, a directory, a
+FIFO) gives the empty string. `diagnose` tells which of these a file is, and why.
+
+A document may have at most the larger of 256 MiB and 1,000 times the file's
+size (the output budget; a hostile file can ask for far more): beyond it the
+call raises `error`. Ctrl-C interrupts a long call within a fraction of a second.
 
 The calls release the interpreter lock while they convert, so threads run them
 in parallel. A path is a `str` or an `os.PathLike` returning `str`; `bytes`
@@ -21,8 +25,10 @@ __version__: str
 
 class error(Exception):
     """Raised when a path's extension is not the one the call expects (".zelmat"
-    or ".zelopt", in any letter case), or when a conversion fails for a reason
-    that lies outside the file (running out of memory raises MemoryError)."""
+    or ".zelopt", in any letter case), when the document would exceed the output
+    budget ("PATH: the XML would exceed N bytes (the output budget)"), or when a
+    conversion fails for a reason that lies outside the file (running out of
+    memory raises MemoryError)."""
 
 def getZelmatXml(path: _Path, /) -> str:
     """Gets the xml from a zelmat file.
@@ -33,7 +39,8 @@ def getZelmatXml(path: _Path, /) -> str:
     the material's own asset. A file that does not read as a material library
     comes back as its own text; a file that cannot be opened gives "".
 
-    Raises `error` when `path` does not end in ".zelmat" (in any letter case).
+    Raises `error` when `path` does not end in ".zelmat" (in any letter case)
+    or the document would exceed the output budget.
     """
 
 def getZeloptXml(path: _Path, /) -> str:
@@ -44,7 +51,8 @@ def getZeloptXml(path: _Path, /) -> str:
     and the environment. A file that does not read as render options comes
     back as its own text; a file that cannot be opened gives "".
 
-    Raises `error` when `path` does not end in ".zelopt" (in any letter case).
+    Raises `error` when `path` does not end in ".zelopt" (in any letter case)
+    or the document would exceed the output budget.
     """
 
 def diagnose(path: _Path, /) -> Optional[str]:
