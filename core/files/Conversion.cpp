@@ -98,7 +98,7 @@ struct InputBytes {
 };
 
 // The bytes of the input: a file read once, or the caller's bytes viewed in place.
-std::optional<InputBytes> bytesOf(const Input& input, std::string& error) {
+std::optional<InputBytes> bytesOf(const Input& input, FileError& error) {
     if (const std::string_view* bytes = input.bytes()) {
         if (bytes->size() <= kLargestBinaryFile) return InputBytes{SharedBytes({}, *bytes), false};
         return InputBytes{SharedBytes({}, text::upToFirstNul(*bytes)), true};
@@ -108,9 +108,10 @@ std::optional<InputBytes> bytesOf(const Input& input, std::string& error) {
     return InputBytes{std::move(content->bytes), content->overLimit};
 }
 
-Diagnosis unopened(std::string why) {
+Diagnosis unopened(FileError why) {
     Diagnosis result;
-    result.failure = ReadFailure{std::move(why), 0, {}};
+    result.failure = ReadFailure{std::move(why.message), 0, {}};
+    result.openError = why.number;
     return result;
 }
 
@@ -150,7 +151,7 @@ std::uint64_t ConversionOptions::outputBudgetFor(std::uint64_t inputSize) const 
 }
 
 Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink, const ConversionOptions& options) {
-    std::string error;
+    FileError error;
     const std::optional<InputBytes> bytes = bytesOf(input, error);
     if (!bytes) return unopened(std::move(error));
     const std::uint64_t budget = options.outputBudgetFor(bytes->bytes.size());
@@ -172,7 +173,7 @@ Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink, const C
 }
 
 Diagnosis diagnose(FileKind kind, const Input& input) {
-    std::string error;
+    FileError error;
     const std::optional<InputBytes> bytes = bytesOf(input, error);
     if (!bytes) return unopened(std::move(error));
     Diagnosis result = withConversion(kind, *bytes, 0, [](auto&& conversion) { return conversion.readThrough(); });

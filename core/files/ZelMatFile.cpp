@@ -227,10 +227,10 @@ std::ios_base::openmode ZelMatFile::probeOpenMode(const std::filesystem::path& p
 }
 
 std::optional<SharedBytes> ZelMatFile::readFile(const std::filesystem::path& path) {
-    std::string error;
+    FileError error;
     std::optional<FileContent> content = readRegularFile(path, &error);
     if (!content) {
-        lastReadFailure_ = ReadFailure{"the file " + error, 0, {}};
+        lastReadFailure_ = ReadFailure{"the file " + error.message, 0, {}};
         return std::nullopt;
     }
     return std::move(content->bytes);

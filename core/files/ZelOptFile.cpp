@@ -18,10 +18,10 @@ bool ZelOptFile::writeFile(OrvexSerializable& object, const std::filesystem::pat
 
 bool ZelOptFile::readFile(OrvexSerializable& object, const std::filesystem::path& path) {
     lastReadFailure_.reset();
-    std::string error;
+    FileError error;
     const std::optional<FileContent> content = readRegularFile(path, &error);
     if (!content) {
-        lastReadFailure_ = ReadFailure{"the file " + error, 0, {}};
+        lastReadFailure_ = ReadFailure{"the file " + error.message, 0, {}};
         return false;
     }
     return readBytes(object, content->bytes.view());

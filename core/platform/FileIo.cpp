@@ -28,12 +28,19 @@ private:
     int fd_;
 };
 
-std::nullopt_t failWith(std::string* error, std::string what) {
-    if (error) *error = std::move(what);
+std::string systemError(std::string_view what) { return std::string(what) + ": " + std::strerror(errno); }
+
+// Fails a read with errno's message and number.
+std::nullopt_t failWith(FileError* error, std::string_view what) {
+    if (error) *error = FileError{systemError(what), errno};
     return std::nullopt;
 }
 
-std::string systemError(std::string_view what) { return std::string(what) + ": " + std::strerror(errno); }
+// Fails a read for a reason of its own, given the errno a system call would have set.
+std::nullopt_t failWith(FileError* error, std::string what, int number) {
+    if (error) *error = FileError{std::move(what), number};
+    return std::nullopt;
+}
 
 // Reads up to `size` bytes at `offset`; the count read, or -1 on an error.
 ssize_t readAt(int fd, char* data, std::size_t size, std::uint64_t offset) {
@@ -49,14 +56,14 @@ ssize_t readAt(int fd, char* data, std::size_t size, std::uint64_t offset) {
 }
 
 // The file's text up to its first NUL, read in pieces.
-std::optional<SharedBytes> readUpToFirstNul(int fd, std::string* error) {
+std::optional<SharedBytes> readUpToFirstNul(int fd, FileError* error) {
     constexpr std::size_t kPiece = std::size_t{1} << 20;
     std::string text;
     for (std::uint64_t offset = 0;;) {
         const std::size_t before = text.size();
         text.resize(before + kPiece);
         const ssize_t n = readAt(fd, text.data() + before, kPiece, offset);
-        if (n < 0) return failWith(error, systemError("cannot be read"));
+        if (n < 0) return failWith(error, "cannot be read");
         text.resize(before + static_cast<std::size_t>(n));
         if (const auto nul = text.find('\0', before); nul != std::string::npos) {
             text.resize(nul);
@@ -70,18 +77,18 @@ std::optional<SharedBytes> readUpToFirstNul(int fd, std::string* error) {
 
 } // namespace
 
-std::optional<FileContent> readRegularFile(const std::filesystem::path& path, std::string* error,
+std::optional<FileContent> readRegularFile(const std::filesystem::path& path, FileError* error,
                                            std::uint64_t largestWhole) {
     // O_NONBLOCK: opening a FIFO for reading must not wait for a writer.
     FileDescriptor file(::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
-    if (file.get() < 0) return failWith(error, systemError("cannot be opened"));
+    if (file.get() < 0) return failWith(error, "cannot be opened");
     // A file whose size changes while it is read is read once more: it was being
     // written, and may be whole now. A second change is an error.
     for (int attempt = 0;; ++attempt) {
         struct stat info {};
-        if (::fstat(file.get(), &info) != 0) return failWith(error, systemError("cannot be read"));
-        if (S_ISDIR(info.st_mode)) return failWith(error, "is a directory");
-        if (!S_ISREG(info.st_mode)) return failWith(error, "is not a regular file");
+        if (::fstat(file.get(), &info) != 0) return failWith(error, "cannot be read");
+        if (S_ISDIR(info.st_mode)) return failWith(error, "is a directory", EISDIR);
+        if (!S_ISREG(info.st_mode)) return failWith(error, "is not a regular file", EINVAL);
 
         const auto size = static_cast<std::uint64_t>(info.st_size);
         if (size > largestWhole) {
@@ -92,14 +99,15 @@ std::optional<FileContent> readRegularFile(const std::filesystem::path& path, st
         char* data = nullptr;
         SharedBytes content = SharedBytes::allocate(static_cast<std::size_t>(size), data);
         const ssize_t read = readAt(file.get(), data, static_cast<std::size_t>(size), 0);
-        if (read < 0) return failWith(error, systemError("cannot be read"));
+        if (read < 0) return failWith(error, "cannot be read");
         char extra = 0;
         const ssize_t more = readAt(file.get(), &extra, 1, size);
-        if (more < 0) return failWith(error, systemError("cannot be read"));
+        if (more < 0) return failWith(error, "cannot be read");
         if (static_cast<std::uint64_t>(read) == size && more == 0) return FileContent{std::move(content), false};
         if (attempt == 1)
             return failWith(error, "changed while it was read (its size said " + std::to_string(size) +
-                                       " bytes, " + (more > 0 ? "more" : std::to_string(read)) + " could be read)");
+                                       " bytes, " + (more > 0 ? "more" : std::to_string(read)) + " could be read)",
+                            EIO);
     }
 }
 

@@ -19,14 +19,22 @@ struct FileContent {
     bool overLimit = false;
 };
 
+// Why a file could not be read: a message for a user ("cannot be opened:
+// Permission denied") and the errno that says it to a program (ENOENT, EACCES,
+// EISDIR; EINVAL for a file that is not a regular file, EIO for one that
+// changed while it was read).
+struct FileError {
+    std::string message;
+    int number = 0;
+};
+
 // The whole content of a regular file, read once into memory of its own. A file
 // larger than `largestWhole` bytes is read only up to its first NUL (see
 // FileContent). A directory, FIFO, device or socket, a file that cannot be
 // opened or read, and one whose length changes while it is read (read again
-// once first) give nullopt, with `error` (when given) saying why: "cannot be
-// opened: Permission denied", "changed while it was read (...)". Never blocks
+// once first) give nullopt, with `error` (when given) saying why. Never blocks
 // on a FIFO.
-std::optional<FileContent> readRegularFile(const std::filesystem::path& path, std::string* error = nullptr,
+std::optional<FileContent> readRegularFile(const std::filesystem::path& path, FileError* error = nullptr,
                                            std::uint64_t largestWhole = std::numeric_limits<std::uint64_t>::max());
 
 // A file written piece by piece and put in place over its target by commit(), so

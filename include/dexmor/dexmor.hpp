@@ -136,7 +136,8 @@ private:
 
 // What a conversion found, from the reading that converted the file.
 struct Diagnosis {
-    bool opened = false;        // false: the file cannot be opened; nothing was written
+    bool opened = false;        // false: the file cannot be opened or read in full; nothing was written
+    int openError = 0;          // then the errno that says why (ENOENT, EACCES, EISDIR, EINVAL, EIO)
     bool readsAsBinary = false; // the document was written; otherwise the pass-through text
     // When it reads as binary: "material library, generation 3, 12 materials" or
     // "render options, version 23".

@@ -206,6 +206,7 @@ TEST_F(Conversions, DiagnosisSaysWhatAFileHoldsOrWhyItDidNotRead) {
     EXPECT_EQ(missing.fallbackLength, 0u);
     ASSERT_TRUE(missing.failure);
     EXPECT_EQ(missing.reason(), "the file cannot be opened: No such file or directory");
+    EXPECT_EQ(missing.openError, ENOENT);
 }
 
 } // namespace
