@@ -5,6 +5,7 @@
 #include <dexmor/files/ConversionContext.hpp>
 #include <dexmor/platform/Text.hpp>
 
+#include "files/DocumentSurvey.hpp"
 #include "files/LibraryConversion.hpp"
 #include "files/OptionsConversion.hpp"
 #include "files/SinkWriter.hpp"
@@ -129,13 +130,13 @@ std::string passThroughText(const SharedBytes& bytes) {
 // Hands the conversion of `bytes` as a file of `kind` to `use`, on a stack deep
 // enough for any nesting the readers accept.
 template <class Use>
-Diagnosis withConversion(FileKind kind, const InputBytes& input, std::uint64_t budget, Use use) {
+Diagnosis withConversion(FileKind kind, const InputBytes& input, std::uint64_t budget, DocumentSurvey* survey, Use use) {
     if (input.overLimit) return tooLargeForAnArchive();
     Diagnosis result;
     runWithStack(kConversionStack, [&] {
         ConversionContext context;
-        result = kind == FileKind::MaterialLibrary ? use(LibraryConversion(context, input.bytes, budget))
-                                                   : use(OptionsConversion(input.bytes, budget));
+        result = kind == FileKind::MaterialLibrary ? use(LibraryConversion(context, input.bytes, budget, survey))
+                                                   : use(OptionsConversion(input.bytes, budget, survey));
     });
     return result;
 }
@@ -156,13 +157,22 @@ Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink, const C
     if (!bytes) return unopened(std::move(error));
     const std::uint64_t budget = options.outputBudgetFor(bytes->bytes.size());
     Diagnosis result;
+    DocumentSurvey survey;
     try {
-        result = withConversion(kind, *bytes, budget, [&sink](auto&& conversion) { return conversion.writeTo(sink); });
+        result = withConversion(kind, *bytes, budget, options.survey ? &survey : nullptr,
+                                [&sink](auto&& conversion) { return conversion.writeTo(sink); });
+        if (options.survey && result.readsAsBinary) {
+            result.materials = survey.materials();
+            result.settings = survey.settingsAssets();
+            result.warnings = survey.warnings();
+        }
         if (!result.readsAsBinary) {
             const std::string text = passThroughText(bytes->bytes);
-            if (budget != 0 && text.size() > budget) throw OutputBudgetExceeded{budget};
             result.fallbackLength = text.size();
-            sink.write(text);
+            if (options.passThrough) {
+                if (budget != 0 && text.size() > budget) throw OutputBudgetExceeded{budget};
+                sink.write(text);
+            }
         }
     } catch (const OutputBudgetExceeded& exceeded) {
         if (sink.canTakeBack()) sink.takeBack();
@@ -176,7 +186,8 @@ Diagnosis diagnose(FileKind kind, const Input& input) {
     FileError error;
     const std::optional<InputBytes> bytes = bytesOf(input, error);
     if (!bytes) return unopened(std::move(error));
-    Diagnosis result = withConversion(kind, *bytes, 0, [](auto&& conversion) { return conversion.readThrough(); });
+    Diagnosis result =
+        withConversion(kind, *bytes, 0, nullptr, [](auto&& conversion) { return conversion.readThrough(); });
     if (!result.readsAsBinary) result.fallbackLength = passThroughText(bytes->bytes).size();
     result.opened = true;
     return result;

@@ -86,9 +86,13 @@ Diagnosis LibraryConversion::writeTo(DocumentSink& sink) {
     }
     switch (writeReadingOnce(sink, result)) {
     case SingleReading::Written: break;
-    case SingleReading::NotALibrary: sink.takeBack(); break;
+    case SingleReading::NotALibrary:
+        sink.takeBack();
+        if (survey_) survey_->reset();
+        break;
     case SingleReading::SunChanged:
         sink.takeBack();
+        if (survey_) survey_->reset();
         context_.defaultSun() = *DefaultSun::pristine();
         context_.restartDocument();
         writeReadingTwice(sink, result);
@@ -99,10 +103,11 @@ Diagnosis LibraryConversion::writeTo(DocumentSink& sink) {
 
 LibraryConversion::SingleReading LibraryConversion::writeReadingOnce(DocumentSink& sink, Diagnosis& result) {
     sink.expect(std::min(bytes_.size() * kExpectedGrowth, kMostExpectedAtOnce));
-    SinkWriter out(sink, budget_);
+    SinkWriter out(sink, budget_, survey_);
     DefaultSunWatch sunWatch;
     const bool read = readMaterials(result, [&](MaterialPtr&& material) {
         if (sunWatch.changedAfterReading()) return; // the text is written again by two readings
+        out.beginMaterial(*material);
         writeMaterialAssets(out.writer(), material);
     });
     if (!read) return SingleReading::NotALibrary;
@@ -121,9 +126,10 @@ void LibraryConversion::writeReadingTwice(DocumentSink& sink, Diagnosis& result)
     const SunLight finalSun = defaultSun;
     defaultSun = pristineSun;
 
-    SinkWriter out(sink, budget_);
+    SinkWriter out(sink, budget_, survey_);
     readMaterials(result, [&](MaterialPtr&& material) {
         defaultSun = finalSun;
+        out.beginMaterial(*material);
         writeMaterialAssets(out.writer(), material);
     });
     out.finish();

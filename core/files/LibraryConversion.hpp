@@ -5,6 +5,8 @@
 #include <dexmor/files/ConversionContext.hpp>
 #include <dexmor/files/ZelMatFile.hpp>
 
+#include "files/DocumentSurvey.hpp"
+
 #include <cstdint>
 
 namespace OrvexKavorCore {
@@ -12,8 +14,10 @@ namespace OrvexKavorCore {
 class LibraryConversion {
 public:
     // `budget`: the most bytes the document may have (0: no limit).
-    LibraryConversion(ConversionContext& context, const SharedBytes& bytes, std::uint64_t budget = 0)
-        : context_(context), bytes_(bytes), budget_(budget) {}
+    // A survey, when given, sees the document as it is written.
+    LibraryConversion(ConversionContext& context, const SharedBytes& bytes, std::uint64_t budget = 0,
+                      DocumentSurvey* survey = nullptr)
+        : context_(context), bytes_(bytes), budget_(budget), survey_(survey) {}
 
     // Reads every material, each dropped as soon as it has read.
     Diagnosis readThrough();
@@ -40,6 +44,7 @@ private:
     ConversionContext& context_;
     const SharedBytes& bytes_;
     std::uint64_t budget_;
+    DocumentSurvey* survey_;
 };
 
 } // namespace OrvexKavorCore

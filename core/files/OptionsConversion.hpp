@@ -3,6 +3,8 @@
 #include <dexmor/dexmor.hpp>
 #include <dexmor/platform/SharedBytes.hpp>
 
+#include "files/DocumentSurvey.hpp"
+
 #include <cstdint>
 
 namespace OrvexKavorCore {
@@ -12,7 +14,9 @@ class AllOptions;
 class OptionsConversion {
 public:
     // `budget`: the most bytes the document may have (0: no limit).
-    explicit OptionsConversion(const SharedBytes& bytes, std::uint64_t budget = 0) : bytes_(bytes), budget_(budget) {}
+    // A survey, when given, sees the document as it is written.
+    explicit OptionsConversion(const SharedBytes& bytes, std::uint64_t budget = 0, DocumentSurvey* survey = nullptr)
+        : bytes_(bytes), budget_(budget), survey_(survey) {}
 
     Diagnosis readThrough();
     // Writes the document to `sink`; nothing when the bytes do not read as an
@@ -25,6 +29,7 @@ private:
 
     const SharedBytes& bytes_;
     std::uint64_t budget_;
+    DocumentSurvey* survey_;
 };
 
 } // namespace OrvexKavorCore

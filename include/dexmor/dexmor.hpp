@@ -24,6 +24,7 @@
 #include <string>
 #include <string_view>
 #include <variant>
+#include <vector>
 
 namespace OrvexKavorCore {
 
@@ -134,6 +135,15 @@ private:
     std::size_t written_ = 0;
 };
 
+// A material of a library as its document shows it.
+struct MaterialSummary {
+    std::string name;
+    std::string kind; // "layered material"
+    // The url of the material's own asset; none when it folds into no asset (a
+    // multi, single-BRDF or instance material).
+    std::optional<std::string> assetUrl;
+};
+
 // What a conversion found, from the reading that converted the file.
 struct Diagnosis {
     bool opened = false;        // false: the file cannot be opened or read in full; nothing was written
@@ -151,6 +161,16 @@ struct Diagnosis {
     // sink that can take its text back has dropped it).
     std::optional<std::uint64_t> exceededBudget;
 
+    // With ConversionOptions::survey, what the document holds: a library's
+    // materials in order, an options document's settings assets (their urls), and
+    // the warnings of its lint: an asset url given to several assets, a plugin
+    // reference that names no asset of the document, a url holding a character
+    // XML 1.0 cannot carry. Each warning names the material ("material 3 "Oak":
+    // the url "/Wood_" is given to 2 assets").
+    std::vector<MaterialSummary> materials;
+    std::vector<std::string> settings;
+    std::vector<std::string> warnings;
+
     // Whether the sink received a whole document: the XML or the pass-through text.
     bool complete() const { return opened && !exceededBudget; }
 
@@ -166,6 +186,13 @@ struct ConversionOptions {
     // twenty times its size; a hostile one can ask for far more than that: its
     // names are repeated in every url beneath them). 0: no limit.
     std::optional<std::uint64_t> maxOutput;
+    // Whether a file that does not read as binary sends its text to the sink (the
+    // result tells its length either way); false for a caller that treats such a
+    // file as an error.
+    bool passThrough = true;
+    // Whether to fill in the Diagnosis's survey of the document (materials,
+    // settings, warnings); it costs a look at every line.
+    bool survey = false;
 
     // The budget for an input of `inputSize` bytes; 0 for none.
     std::uint64_t outputBudgetFor(std::uint64_t inputSize) const;

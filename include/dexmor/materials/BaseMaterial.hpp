@@ -79,6 +79,8 @@ public:
     bool readFromArchive(QuickArchive& ar) override { return readBaseRecord(ar); }
 
     virtual std::int32_t kindId() const = 0;
+    // The kind in words ("layered material").
+    virtual const char* kindName() const { return "material"; }
     virtual void resetToDefaults() = 0;
     // Deep copy that receives a new unique name.
     virtual boost::shared_ptr<BaseMaterial> cloneRenamed() const = 0;

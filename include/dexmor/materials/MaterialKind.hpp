@@ -184,6 +184,7 @@ public:
     explicit MaterialKind(Unnamed tag) : BaseMaterial(tag) {}
 
     std::int32_t kindId() const override { return Derived::kInfo.kind; }
+    const char* kindName() const override { return Derived::kInfo.what; }
     std::string pluginType() const override { return Derived::kInfo.pluginType; }
 
     void resetToDefaults() override {
