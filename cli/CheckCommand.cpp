@@ -1,13 +1,17 @@
-// dexmor check FILE...
+// dexmor check [--json] [--strict] [--kind KIND] FILE...
 //
-// Tells, one line per FILE, whether it reads as a binary file of the kind its
-// extension names, and when it does not, why not and what the conversion gives
-// instead.
+// Tells, for each FILE (a folder: every file of both kinds beneath it; "-":
+// standard input), whether it reads as a binary file of its kind, and when it
+// does not, why not and what the conversion gives instead; then the warnings of
+// the lint of its document (urls given twice, references to no asset, characters
+// XML cannot carry). With --json, one JSON object a line.
 #include "Commands.hpp"
+#include "Reports.hpp"
 
 #include <dexmor/dexmor.hpp>
 
-#include <filesystem>
+#include <nlohmann/json.hpp>
+
 #include <optional>
 #include <string>
 #include <vector>
@@ -20,7 +24,11 @@ namespace core = OrvexKavorCore;
 
 std::string lineOf(std::string_view name, const core::Diagnosis& diagnosis) {
     std::string line = shownName(name);
-    if (diagnosis.readsAsBinary) return line + ": " + diagnosis.description + "\n";
+    if (diagnosis.readsAsBinary) {
+        line += ": " + diagnosis.description + "\n";
+        for (const std::string& warning : diagnosis.warnings) line += shownName(name) + ": warning: " + warning + "\n";
+        return line;
+    }
     line += ": not readable as binary: ";
     line += diagnosis.reason();
     if (diagnosis.fallbackLength > 0)
@@ -30,44 +38,58 @@ std::string lineOf(std::string_view name, const core::Diagnosis& diagnosis) {
     return line + "\n";
 }
 
+// The record path "a / b / c" as its parts.
+std::vector<std::string> partsOf(const std::string& path) {
+    std::vector<std::string> parts;
+    for (std::size_t start = 0; !path.empty() && start <= path.size();) {
+        const auto end = path.find(" / ", start);
+        parts.push_back(path.substr(start, end == std::string::npos ? std::string::npos : end - start));
+        if (end == std::string::npos) break;
+        start = end + 3;
+    }
+    return parts;
+}
+
+std::string jsonLineOf(const Source& source, const core::Diagnosis& diagnosis) {
+    nlohmann::ordered_json line = {
+        {"path", source.name},
+        {"kind", core::extensionOf(source.kind)},
+        {"reads_as_binary", diagnosis.readsAsBinary},
+        {"description", diagnosis.readsAsBinary ? nlohmann::ordered_json(diagnosis.description) : nullptr},
+    };
+    if (!diagnosis.readsAsBinary) {
+        line["reason"] = diagnosis.opened && diagnosis.failure ? diagnosis.failure->reason : diagnosis.reason();
+        line["offset"] = diagnosis.opened && diagnosis.failure ? nlohmann::ordered_json(diagnosis.failure->offset) : nullptr;
+        line["record_path"] = diagnosis.failure ? partsOf(diagnosis.failure->recordPath) : std::vector<std::string>{};
+        line["fallback_bytes"] = diagnosis.fallbackLength;
+    }
+    line["warnings"] = diagnosis.warnings;
+    return line.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+}
+
 } // namespace
 
 int runCheck(Args args) {
-    std::vector<std::string_view> files;
-    bool optionsEnd = false;
-    for (const std::string_view arg : args) {
-        if (optionsEnd || arg.size() < 2 || arg[0] != '-')
-            files.push_back(arg);
-        else if (arg == "--")
-            optionsEnd = true;
-        else if (arg == "-h" || arg == "--help")
-            return showText(helpText);
-        else
-            return usageError({"check: unknown option '", arg, "'"});
-    }
-    if (files.empty()) return usageError({"check: no FILE given"});
+    int exitStatus = Rejected;
+    const std::optional<ReportArgs> parsed = parseReportArgs(args, "check", exitStatus);
+    if (!parsed) return exitStatus;
 
-    StandardOutput out;
-    bool allBinary = true;
     bool rejected = false;
+    const std::vector<Source> sources = sourcesOf(parsed->files, parsed->kind, {"checked", false}, rejected);
+    StandardOutput out;
+    bool allGood = true;
     bool outputGone = false;
-    for (const std::string_view name : files) {
-        const std::optional<core::FileKind> kind = core::fileKindOf(name);
-        if (!kind) {
-            complain({shownName(name), ": not checked, the name ends in neither .zelmat nor .zelopt"});
-            rejected = true;
-            continue;
-        }
-        const core::Diagnosis diagnosis = core::diagnose(*kind, std::filesystem::path(std::string(name)));
-        allBinary = allBinary && diagnosis.readsAsBinary;
-        if (!out.write(lineOf(name, diagnosis))) {
+    for (const Source& source : sources) {
+        const core::Diagnosis diagnosis = surveyOf(source);
+        allGood = allGood && diagnosis.readsAsBinary && (!parsed->strict || diagnosis.warnings.empty());
+        if (!out.write(parsed->json ? jsonLineOf(source, diagnosis) : lineOf(source.name, diagnosis))) {
             outputGone = true;
             break;
         }
     }
     if (!out.finish()) outputGone = true;
     if (rejected) return Rejected;
-    return allBinary && !outputGone ? Success : Failed;
+    return allGood && !outputGone ? Success : Failed;
 }
 
 } // namespace dexmor

@@ -6,5 +6,6 @@ namespace dexmor {
 
 int runXml(Args args);
 int runCheck(Args args);
+int runList(Args args);
 
 } // namespace dexmor

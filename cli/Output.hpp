@@ -14,6 +14,7 @@ using Args = std::span<const std::string_view>;
 constexpr int Success = 0;
 constexpr int Failed = 1;   // an output could not be written, a conversion failed, a check found a file not binary
 constexpr int Rejected = 2; // bad usage, or a FILE that cannot be converted
+constexpr int Strict = 3;   // with --strict, a FILE that does not read as binary
 
 // The status of two outcomes together: the lower non-zero one.
 constexpr int worse(int a, int b) { return a == Success ? b : b == Success ? a : a < b ? a : b; }

@@ -9,8 +9,8 @@
 
 namespace dexmor {
 
-ProgressLine::ProgressLine(std::size_t totalFiles)
-    : total_(totalFiles), shown_(::isatty(STDERR_FILENO) == 1), start_(std::chrono::steady_clock::now()) {}
+ProgressLine::ProgressLine(std::size_t totalFiles, bool wanted)
+    : total_(totalFiles), shown_(wanted && ::isatty(STDERR_FILENO) == 1), start_(std::chrono::steady_clock::now()) {}
 
 void ProgressLine::update(std::size_t filesDone, std::uint64_t bytesWritten) {
     if (!shown_) return;

@@ -10,7 +10,8 @@ namespace dexmor {
 
 class ProgressLine {
 public:
-    explicit ProgressLine(std::size_t totalFiles);
+    // `wanted`: false hides the line even on a terminal.
+    ProgressLine(std::size_t totalFiles, bool wanted);
 
     bool shown() const { return shown_; }
     // Redraws the line with the current counts.

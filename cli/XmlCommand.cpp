@@ -1,21 +1,23 @@
-// dexmor xml [-o DIR] [-j N] [--max-output BYTES] FILE...
+// dexmor xml [-o DIR] [-j N] [--max-output BYTES] [--kind KIND] [--strict] [-q] [--no-progress] FILE...
 //
-// Converts each FILE and writes its document to standard output (in argument
-// order) or, with -o, to DIR/<file name>.xml. With -o the files are converted on
-// N threads at once; each document is streamed into a file that takes the
-// target's place only when complete, so no reader ever sees half a document, and
-// a file that cannot be read or whose XML would exceed the output budget leaves
-// its target as it was.
+// Converts each FILE (a folder: every file of both kinds beneath it; "-": standard
+// input) and writes its document to standard output (in argument order) or, with
+// -o, to DIR/<file name>.xml (files found in a folder: DIR/<path beneath it>.xml).
+// With -o the files are converted on N threads at once; each document is
+// streamed into a file that takes the target's place only when complete, so no
+// reader ever sees half a document, and a file that cannot be read or whose XML
+// would exceed the output budget leaves its target as it was. Every file that
+// does not read as binary is reported on standard error with the reason.
 #include "Commands.hpp"
+#include "Inputs.hpp"
+#include "Options.hpp"
 #include "Progress.hpp"
 
 #include <dexmor/dexmor.hpp>
 
 #include <algorithm>
 #include <atomic>
-#include <cerrno>
 #include <charconv>
-#include <cstring>
 #include <exception>
 #include <filesystem>
 #include <map>
@@ -25,9 +27,6 @@
 #include <system_error>
 #include <thread>
 #include <vector>
-
-#include <sys/stat.h>
-#include <unistd.h>
 
 namespace dexmor {
 
@@ -39,6 +38,11 @@ namespace fs = std::filesystem;
 struct XmlArgs {
     std::optional<fs::path> outputDir;
     unsigned jobs = 0; // 0: one per core
+    bool jobsGiven = false;
+    std::optional<core::FileKind> kind;
+    bool strict = false;
+    bool quiet = false;
+    bool progress = true;
     core::ConversionOptions options;
     std::vector<std::string_view> files;
 };
@@ -50,36 +54,6 @@ std::optional<unsigned> parseJobs(std::string_view text) {
     const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), jobs);
     if (error != std::errc() || end != text.data() + text.size() || jobs == 0 || jobs > 1024) return std::nullopt;
     return jobs;
-}
-
-std::optional<std::uint64_t> parseBytes(std::string_view text) {
-    std::uint64_t bytes = 0;
-    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), bytes);
-    if (error != std::errc() || end != text.data() + text.size()) return std::nullopt;
-    return bytes;
-}
-
-enum class Match { No, Missing, Found };
-
-// Whether args[i] is the option with these names, given as "-o DIR", "-oDIR",
-// "--output DIR" or "--output=DIR"; `value` receives its value.
-Match optionValue(Args args, std::size_t& i, std::string_view shortName, std::string_view longName,
-                  std::string_view& value) {
-    const std::string_view arg = args[i];
-    if ((!shortName.empty() && arg == shortName) || arg == longName) {
-        if (i + 1 == args.size()) return Match::Missing;
-        value = args[++i];
-        return Match::Found;
-    }
-    if (arg.starts_with(longName) && arg.size() > longName.size() && arg[longName.size()] == '=') {
-        value = arg.substr(longName.size() + 1);
-        return Match::Found;
-    }
-    if (!shortName.empty() && !arg.starts_with("--") && arg.starts_with(shortName)) {
-        value = arg.substr(shortName.size());
-        return Match::Found;
-    }
-    return Match::No;
 }
 
 std::nullopt_t refuse(std::initializer_list<std::string_view> pieces) {
@@ -102,6 +76,12 @@ std::optional<XmlArgs> parseXmlArgs(Args args, bool& help) {
         } else if (arg == "-h" || arg == "--help") {
             help = true;
             return parsed;
+        } else if (arg == "--strict") {
+            parsed.strict = true;
+        } else if (arg == "-q" || arg == "--quiet") {
+            parsed.quiet = true;
+        } else if (arg == "--no-progress") {
+            parsed.progress = false;
         } else if (const Match output = optionValue(args, i, "-o", "--output", value); output != Match::No) {
             if (output == Match::Missing) return refuse({"xml: option ", arg, " needs a directory"});
             if (parsed.outputDir) return refuse({"xml: the output directory is given more than once"});
@@ -112,55 +92,30 @@ std::optional<XmlArgs> parseXmlArgs(Args args, bool& help) {
             const std::optional<unsigned> count = parseJobs(value);
             if (!count) return refuse({"xml: the number of jobs must be from 1 to 1024, not '", value, "'"});
             parsed.jobs = *count;
+            parsed.jobsGiven = true;
         } else if (const Match budget = optionValue(args, i, "", "--max-output", value); budget != Match::No) {
             if (budget == Match::Missing) return refuse({"xml: option ", arg, " needs a number of bytes"});
             const std::optional<std::uint64_t> bytes = parseBytes(value);
             if (!bytes) return refuse({"xml: the output budget must be a number of bytes (0: no limit), not '", value, "'"});
             parsed.options.maxOutput = *bytes;
+        } else if (const Match kind = optionValue(args, i, "", "--kind", value); kind != Match::No) {
+            if (kind == Match::Missing) return refuse({"xml: option ", arg, " needs zelmat or zelopt"});
+            parsed.kind = parseKind(value);
+            if (!parsed.kind) return refuse({"xml: the kind must be zelmat or zelopt, not '", value, "'"});
         } else {
             return refuse({"xml: unknown option '", arg, "'"});
         }
     }
     if (parsed.files.empty()) return refuse({"xml: no FILE given"});
+    parsed.options.passThrough = !parsed.strict;
     return parsed;
 }
 
-// Why `path` cannot be read as a file, or nullopt when it can.
-std::optional<std::string> unreadable(const fs::path& path) {
-    struct stat info {};
-    if (::stat(path.c_str(), &info) != 0) return std::strerror(errno);
-    if (S_ISDIR(info.st_mode)) return "is a directory";
-    if (!S_ISREG(info.st_mode)) return "is not a regular file";
-    if (::access(path.c_str(), R_OK) != 0) return std::strerror(errno);
-    return std::nullopt;
-}
-
-// A FILE to convert: what the command line named, and what it will be converted as.
+// A source to convert, and with -o where its document goes.
 struct Job {
-    std::string_view name;
-    fs::path file;
-    core::FileKind kind;
-    fs::path target; // with -o
+    Source source;
+    fs::path target;
 };
-
-// The jobs of the FILEs that can be converted; each one that cannot is reported.
-std::vector<Job> jobsOf(const std::vector<std::string_view>& files, bool& rejected) {
-    std::vector<Job> jobs;
-    for (const std::string_view name : files) {
-        const fs::path file{std::string(name)};
-        const std::optional<core::FileKind> kind = core::fileKindOf(name);
-        if (!kind) {
-            complain({shownName(name), ": not converted, the name ends in neither .zelmat nor .zelopt"});
-            rejected = true;
-        } else if (const std::optional<std::string> why = unreadable(file)) {
-            complain({shownName(name), ": not converted, ", *why});
-            rejected = true;
-        } else {
-            jobs.push_back(Job{name, file, *kind, {}});
-        }
-    }
-    return jobs;
-}
 
 // Sends a document on up to its first NUL, as the Python module's text ends there.
 class UpToFirstNul final : public core::DocumentSink {
@@ -185,49 +140,57 @@ private:
     bool ended_ = false;
 };
 
-// How one FILE's conversion ended, with the message for the user when it failed.
+// How one source's conversion ended.
 struct Outcome {
-    int status = Success; // Success, Failed or Rejected
-    std::string message;
+    enum Kind { Converted, PassedThrough, NotConverted } kind = Converted;
+    int status = Success; // Success, Failed, Rejected or Strict
+    std::string message;  // for the user; empty when there is nothing to say
 };
 
-// The outcome of a conversion that did not give a whole document, or nullopt
-// when it did.
-std::optional<Outcome> incomplete(const Job& job, const core::Diagnosis& result) {
-    if (!result.opened) return Outcome{Rejected, shownName(job.name) + ": not converted, " + result.reason()};
-    if (result.exceededBudget)
-        return Outcome{Failed, shownName(job.name) + ": the XML would exceed " + std::to_string(*result.exceededBudget) +
-                                   " bytes (the output budget; --max-output to change it)"};
-    return std::nullopt;
+std::string_view whatItIsNot(core::FileKind kind) {
+    return kind == core::FileKind::MaterialLibrary ? "not a readable material library"
+                                                   : "not a readable render-options file";
 }
 
-// Converts one FILE into its target under -o, counting the bytes written.
-Outcome convertToFile(const Job& job, const core::ConversionOptions& options, std::uint64_t& bytesWritten) {
+// What a finished conversion tells the user, from its result.
+Outcome outcomeOf(const Source& source, const core::Diagnosis& result, bool strict) {
+    const std::string name = shownName(source.name);
+    if (!result.opened) return {Outcome::NotConverted, Rejected, name + ": not converted, " + result.reason()};
+    if (result.exceededBudget)
+        return {Outcome::NotConverted, Failed,
+                name + ": the XML would exceed " + std::to_string(*result.exceededBudget) +
+                    " bytes (the output budget; --max-output to change it)"};
+    if (result.readsAsBinary) return {};
+    std::string message = name + ": " + std::string(whatItIsNot(source.kind)) + " (" + result.reason() + "); ";
+    if (strict) return {Outcome::NotConverted, Strict, message + "not written (--strict)"};
+    return {Outcome::PassedThrough, Success,
+            message + "wrote its text instead (" + std::to_string(result.fallbackLength) + " bytes)"};
+}
+
+// Converts one source into its target under -o, counting the bytes written.
+Outcome convertToFile(const Job& job, const XmlArgs& args, std::uint64_t& bytesWritten) {
     // The document goes to a file that has not taken the target's place yet, so a
     // library can be read once: what it sent before failing is taken back, and
     // the pass-through text follows.
+    if (std::error_code error; !fs::create_directories(job.target.parent_path(), error) && error)
+        return {Outcome::NotConverted, Failed,
+                "cannot create directory " + shownName(job.target.parent_path().native()) + ": " + error.message()};
     core::AtomicFileSink output(job.target);
     bytesWritten = 0;
+    Outcome outcome;
     try {
         UpToFirstNul cut(output);
-        if (std::optional<Outcome> failed = incomplete(job, core::convert(job.kind, job.file, cut, options)))
-            return *failed; // the target stays as it was
+        outcome = outcomeOf(job.source, core::convert(job.source.kind, job.source.input(), cut, args.options), args.strict);
     } catch (const std::bad_alloc&) {
-        return {Failed, shownName(job.name) + ": conversion failed: out of memory"};
+        return {Outcome::NotConverted, Failed, shownName(job.source.name) + ": conversion failed: out of memory"};
     } catch (const std::exception& error) {
-        return {Failed, shownName(job.name) + ": conversion failed: " + error.what()};
+        return {Outcome::NotConverted, Failed, shownName(job.source.name) + ": conversion failed: " + error.what()};
     }
+    if (outcome.kind == Outcome::NotConverted) return outcome; // the target stays as it was
     std::string error;
-    if (!output.commit(&error)) return {Failed, error};
+    if (!output.commit(&error)) return {Outcome::NotConverted, Failed, error};
     bytesWritten = output.bytesWritten();
-    return {};
-}
-
-// Where -o DIR puts the document of `file`: DIR/<file name>.xml.
-fs::path outputPathOf(const fs::path& dir, const fs::path& file) {
-    fs::path target = dir / file.filename();
-    target += ".xml";
-    return target;
+    return outcome;
 }
 
 bool sameFile(const fs::path& a, const fs::path& b) {
@@ -235,27 +198,37 @@ bool sameFile(const fs::path& a, const fs::path& b) {
     return a == b || fs::equivalent(a, b, ignored);
 }
 
-// Gives each job its target. A FILE named twice is converted once; two FILEs whose
-// documents would land in the same target are refused after the first.
-std::vector<Job> assignTargets(std::vector<Job> jobs, const fs::path& dir, bool& failed) {
-    std::vector<Job> kept;
-    std::map<fs::path, fs::path> claimed; // target -> the FILE it is for
-    for (Job& job : jobs) {
-        job.target = outputPathOf(dir, job.file);
-        const auto [earlier, fresh] = claimed.emplace(job.target, job.file);
-        if (fresh) {
-            kept.push_back(std::move(job));
-        } else if (!sameFile(earlier->second, job.file)) {
-            complain({shownName(job.name), ": not written, ", shownName(job.target.native()),
-                      " already holds the document of ", shownName(earlier->second.native())});
+// Gives each source its target beneath `dir`; two sources whose documents would
+// land in the same target are refused after the first.
+std::vector<Job> jobsWithTargets(std::vector<Source> sources, const fs::path& dir, bool& failed) {
+    std::vector<Job> jobs;
+    std::map<fs::path, const Source*> claimed; // target -> the source it is for
+    jobs.reserve(sources.size());
+    for (Source& source : sources) {
+        fs::path target = dir / source.outputName;
+        const auto earlier = claimed.find(target);
+        if (earlier == claimed.end()) {
+            jobs.push_back(Job{std::move(source), std::move(target)});
+            claimed.emplace(jobs.back().target, &jobs.back().source);
+        } else if (!sameFile(earlier->second->file, source.file)) {
+            complain({shownName(source.name), ": not written, ", shownName(target.native()),
+                      " already holds the document of ", shownName(earlier->second->name)});
             failed = true;
         }
     }
-    return kept;
+    return jobs;
+}
+
+// The line after a batch: "304 converted, 3 passed through as text, 1 not converted".
+std::string summaryOf(const std::vector<Outcome>& outcomes, std::size_t refused) {
+    std::size_t counts[3] = {0, 0, refused};
+    for (const Outcome& outcome : outcomes) ++counts[outcome.kind];
+    return std::to_string(counts[Outcome::Converted]) + " converted, " + std::to_string(counts[Outcome::PassedThrough]) +
+           " passed through as text, " + std::to_string(counts[Outcome::NotConverted]) + " not converted";
 }
 
 // Converts the jobs on up to `threads` threads, showing progress; the exit status.
-int convertAll(const std::vector<Job>& jobs, const core::ConversionOptions& options, unsigned threads) {
+int convertAll(const std::vector<Job>& jobs, const XmlArgs& args, unsigned threads, std::size_t refused) {
     std::vector<Outcome> outcomes(jobs.size());
     std::atomic<std::size_t> next{0};
     std::atomic<std::size_t> done{0};
@@ -263,13 +236,13 @@ int convertAll(const std::vector<Job>& jobs, const core::ConversionOptions& opti
     const auto work = [&] {
         for (std::size_t i; (i = next.fetch_add(1)) < jobs.size();) {
             std::uint64_t bytes = 0;
-            outcomes[i] = convertToFile(jobs[i], options, bytes);
+            outcomes[i] = convertToFile(jobs[i], args, bytes);
             written += bytes;
             ++done;
         }
     };
 
-    ProgressLine progress(jobs.size());
+    ProgressLine progress(jobs.size(), args.progress && !args.quiet);
     {
         std::vector<std::jthread> workers;
         // When the system gives fewer threads than asked for, those it gave do the work.
@@ -295,11 +268,11 @@ int convertAll(const std::vector<Job>& jobs, const core::ConversionOptions& opti
     progress.finish(done, written);
 
     int status = Success;
-    for (const Outcome& outcome : outcomes)
-        if (outcome.status != Success) {
-            complain({outcome.message});
-            status = worse(status, outcome.status);
-        }
+    for (const Outcome& outcome : outcomes) {
+        if (!outcome.message.empty() && (!args.quiet || outcome.status != Success)) complain({outcome.message});
+        status = worse(status, outcome.status);
+    }
+    if (!args.quiet) complain({summaryOf(outcomes, refused)});
     return status;
 }
 
@@ -307,7 +280,7 @@ int convertAll(const std::vector<Job>& jobs, const core::ConversionOptions& opti
 // to a quarter megabyte; the exit status. A document that would exceed the
 // output budget ends the output: what was written of it stays, and nothing
 // more follows.
-int writeAllToStandardOutput(const std::vector<Job>& jobs, const core::ConversionOptions& options) {
+int writeAllToStandardOutput(const std::vector<Source>& sources, const XmlArgs& args) {
     constexpr std::size_t kWriteSize = std::size_t{1} << 18;
     StandardOutput out;
     std::string pending;
@@ -323,16 +296,16 @@ int writeAllToStandardOutput(const std::vector<Job>& jobs, const core::Conversio
         if (!outputGone) send(piece);
     });
     int status = Success;
-    for (const Job& job : jobs) {
+    for (const Source& source : sources) {
         UpToFirstNul cut(toOutput);
         try {
-            if (const std::optional<Outcome> failed = incomplete(job, core::convert(job.kind, job.file, cut, options))) {
-                complain({failed->message});
-                status = worse(status, failed->status);
-                if (failed->status == Failed) break;
-            }
+            const Outcome outcome =
+                outcomeOf(source, core::convert(source.kind, source.input(), cut, args.options), args.strict);
+            if (!outcome.message.empty() && (!args.quiet || outcome.status != Success)) complain({outcome.message});
+            status = worse(status, outcome.status);
+            if (outcome.status == Failed) break;
         } catch (const std::exception& error) {
-            complain({shownName(job.name), ": conversion failed: ", error.what()});
+            complain({shownName(source.name), ": conversion failed: ", error.what()});
             status = Failed;
         }
         if (outputGone) break; // standard output is gone; the other documents have nowhere to go
@@ -352,22 +325,25 @@ int runXml(Args args) {
 
     bool rejected = false;
     bool failed = false;
-    std::vector<Job> jobs = jobsOf(parsed->files, rejected);
+    std::vector<Source> sources = sourcesOf(parsed->files, parsed->kind, {"converted", true}, rejected);
     int status = Success;
     if (!parsed->outputDir) {
-        status = writeAllToStandardOutput(jobs, parsed->options);
+        if (parsed->jobsGiven && !parsed->quiet)
+            complain({"xml: -j applies with -o only; the files are converted one at a time"});
+        status = writeAllToStandardOutput(sources, *parsed);
     } else {
         std::error_code error;
         fs::create_directories(*parsed->outputDir, error);
         if (error || !fs::is_directory(*parsed->outputDir, error)) {
-            complain({"cannot create directory ", parsed->outputDir->native(), ": ",
+            complain({"cannot create directory ", shownName(parsed->outputDir->native()), ": ",
                       error ? error.message() : std::string("it is not a directory")});
             return Failed;
         }
-        jobs = assignTargets(std::move(jobs), *parsed->outputDir, failed);
+        const std::size_t named = sources.size();
+        std::vector<Job> jobs = jobsWithTargets(std::move(sources), *parsed->outputDir, failed);
         const unsigned threads = std::clamp<std::size_t>(parsed->jobs ? parsed->jobs : coreCount(), 1,
                                                           std::max<std::size_t>(jobs.size(), 1));
-        status = convertAll(jobs, parsed->options, threads);
+        status = convertAll(jobs, *parsed, threads, named - jobs.size());
     }
     if (failed) status = worse(status, Failed);
     if (rejected) status = worse(status, Rejected);

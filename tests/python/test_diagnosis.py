@@ -44,8 +44,12 @@ def test_check_prints_one_line_per_file(files):
     run = subprocess.run([CLI, "check", *(str(files[n]) for n in names)], capture_output=True, timeout=60)
     assert (run.returncode, run.stderr) == (1, b"")
     lines = run.stdout.decode().splitlines()
+    # The sample truly has one lint finding: a material with two layers of one name.
+    twice = 'material 1 "Brushed Steel 2": the url "/Brushed Steel 2/BRDFReflection{}" is given to 2 assets'
     assert lines == [
         f"{files['library']}: material library, generation 3, 20 materials",
+        f"{files['library']}: warning: " + twice.format(""),
+        f"{files['library']}: warning: " + twice.format("/transparency_texture"),
         f"{files['options']}: render options, version 23",
         f"{files['damaged']}: not readable as binary: material 0: unknown material kind 41 at offset 16;"
         " the conversion returns the empty text",

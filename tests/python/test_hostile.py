@@ -49,7 +49,7 @@ def test_output_budget_stops_the_tool_with_bounded_memory(amplifier, tmp_path):
     if peak > before and "LD_PRELOAD" not in os.environ:  # sanitizers keep freed memory on purpose
         assert peak < 64 * 1024, f"peak {peak} KiB"
 
-    run = dexmor("xml", "--max-output=100000", "-o", tmp_path / "out", SAMPLE)
+    run = dexmor("xml", "-q", "--max-output=100000", "-o", tmp_path / "out", SAMPLE)
     assert (run.returncode, run.stderr.decode()) == (1, budget_message(SAMPLE, 100000))
     assert os.listdir(tmp_path / "out") == []  # no output file, no temporary
     run = dexmor("xml", "--max-output", "0", SAMPLE)
@@ -111,7 +111,7 @@ def test_a_file_size_limit_fails_the_write_instead_of_killing_the_tool(tmp_path)
 def test_names_up_to_the_file_system_limit_and_control_characters(tmp_path):
     long_name = "n" * (255 - len(".zelmat.xml")) + ".zelmat"
     (tmp_path / long_name).write_bytes(SAMPLE.read_bytes())
-    run = dexmor("xml", "-o", tmp_path / "out", tmp_path / long_name)
+    run = dexmor("xml", "-q", "-o", tmp_path / "out", tmp_path / long_name)
     assert (run.returncode, run.stderr) == (0, b"")
     assert os.listdir(tmp_path / "out") == [long_name + ".xml"]
 

@@ -1,0 +1,30 @@
+#pragma once
+// What the reporting commands (check, list) share: their arguments and the
+// survey of each file's document.
+#include "Inputs.hpp"
+#include "Output.hpp"
+
+#include <dexmor/dexmor.hpp>
+
+#include <optional>
+#include <string_view>
+#include <vector>
+
+namespace dexmor {
+
+struct ReportArgs {
+    bool json = false;
+    bool strict = false;
+    std::optional<OrvexKavorCore::FileKind> kind;
+    std::vector<std::string_view> files;
+};
+
+// Parses "[--json] [--strict] [--kind KIND] FILE..." for `command`; nullopt after
+// a usage message, or with `exitStatus` set when the arguments ask for help.
+std::optional<ReportArgs> parseReportArgs(Args args, std::string_view command, int& exitStatus);
+
+// Converts `source` without keeping the document, for what the conversion
+// finds: the diagnosis with the survey of the document.
+OrvexKavorCore::Diagnosis surveyOf(const Source& source);
+
+} // namespace dexmor
