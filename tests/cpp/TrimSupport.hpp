@@ -1,0 +1,54 @@
+#pragma once
+// Checks that most record tests share: a whole round trip of an object and its copy,
+// a read that must fail for a given reason, and a record with one word replaced.
+#include "TestSupport.hpp"
+
+#include <cstring>
+#include <string>
+#include <string_view>
+
+namespace testsupport {
+
+// `original` writes a record that reads into `make()` as an equal object writing the
+// same bytes; its copy is another object, equal to it and writing the same bytes.
+// `sameCopy` may make the copy comparable first (a sky's copy has its own identifier).
+template <class Ptr, class Make, class SameCopy>
+ByteVector expectRoundTrip(const Ptr& original, Make make, SameCopy sameCopy) {
+    const ByteVector bytes = recordOf(*original);
+    const auto read = make();
+    QuickArchive ar;
+    EXPECT_TRUE(readInto(*read, bytes, &ar)) << failureOf(ar);
+    EXPECT_TRUE(read->isEqual(original));
+    EXPECT_TRUE(original->isEqual(read));
+    EXPECT_EQ(recordOf(*read), bytes);
+    const auto copy = original->clone();
+    EXPECT_TRUE(copy && copy != original);
+    if (!copy) return bytes;
+    sameCopy(*copy);
+    EXPECT_TRUE(copy->isEqual(original));
+    EXPECT_EQ(recordOf(*copy), bytes);
+    return bytes;
+}
+template <class Ptr, class Make>
+ByteVector expectRoundTrip(const Ptr& original, Make make) {
+    return expectRoundTrip(original, make, [](auto&) {});
+}
+
+// Reading `bytes` into `object` fails, and the failure's description contains `reason`.
+template <class Object>
+void expectReadFails(Object& object, const ByteVector& bytes, std::string_view reason) {
+    QuickArchive ar;
+    EXPECT_FALSE(readInto(object, bytes, &ar)) << reason;
+    EXPECT_NE(failureOf(ar).find(reason), std::string::npos) << failureOf(ar);
+}
+
+// `bytes` with the 32-bit word at `at` replaced.
+inline ByteVector withWord(ByteVector bytes, std::size_t at, std::uint32_t value) {
+    std::memcpy(bytes.data() + at, &value, 4);
+    return bytes;
+}
+inline ByteVector withVersion(ByteVector bytes, std::uint16_t first, std::uint16_t second, std::size_t at = 0) {
+    return withWord(std::move(bytes), at, first | std::uint32_t{second} << 16);
+}
+
+} // namespace testsupport
