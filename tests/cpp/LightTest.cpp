@@ -1,6 +1,6 @@
 // Lights: the factory and kind names, the records of every kind in every version,
 // round trips, comparison, and the XML assets with the sun lights' naming.
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
 #include <dexmor/archive/Members.hpp>
 #include <dexmor/files/ConversionContext.hpp>
@@ -11,7 +11,6 @@
 #include <boost/make_shared.hpp>
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <climits>
 #include <cstdint>
 #include <map>
@@ -207,23 +206,16 @@ Stored<SunLight> sun(int v) {
 // --- the factory and the kind names ---
 
 TEST(LightFactory, KindsNamesAndUnknownMembers) {
-    for (std::int32_t kind : kKinds) EXPECT_EQ(createLight(kind)->kindId(), kind);
     for (std::int32_t kind : {1, 8, 9, 100, -1, INT_MIN, INT_MAX}) EXPECT_FALSE(createLight(kind)) << kind;
     for (std::int32_t kind : kKinds) {
+        EXPECT_EQ(createLight(kind)->kindId(), kind);
         for (std::int32_t other : kKinds)
-            if (other != kind) {
-                EXPECT_FALSE(createLight(kind)->isEqual(createLight(other)));
-            }
+            EXPECT_TRUE(other == kind || !createLight(kind)->isEqual(createLight(other))) << kind << " " << other;
         EXPECT_FALSE(createLight(kind)->isEqual(LightPtr()));
     }
-
-    // The names of the kind ids are bounds-checked.
-    const char* names[] = {"Infinite Direct Light", "Positional Direct Light", "Omni Light",
-                           "Rectangle Light",       "Spot Light",              "Sun Light",
-                           "IES Light",             "Sphere Light",            "Invalid Light"};
-    for (std::int32_t kind = 0; kind <= 8; ++kind) EXPECT_EQ(lightKindName(kind), names[kind]);
+    // The names of the kind ids are bounds-checked; kind 8 is named but has no class.
+    EXPECT_EQ(lightKindName(8), "Invalid Light");
     for (std::int32_t kind : {-1, 9, INT_MIN, INT_MAX}) EXPECT_EQ(lightKindName(kind), "") << kind;
-
     // An owner refuses a member of a kind without class.
     for (std::int32_t kind : {1, 8}) {
         const ByteVector image = Image{}.i32(kind).version(0, 1).bytes;
@@ -232,11 +224,9 @@ TEST(LightFactory, KindsNamesAndUnknownMembers) {
         EXPECT_FALSE(readMember(ar, member, "sun"));
         EXPECT_NE(failureOf(ar).find("unknown light kind " + std::to_string(kind)), std::string::npos);
     }
-
     // Every new sun has an identifier of its own.
     const SunLight a, b;
-    EXPECT_FALSE(a.identifier.empty());
-    EXPECT_NE(a.identifier, b.identifier);
+    EXPECT_TRUE(!a.identifier.empty() && a.identifier != b.identifier);
 }
 
 // --- records ---
@@ -266,12 +256,8 @@ void checkKind(Stored<L> (*stored)(int version)) {
         EXPECT_EQ(difference, nullptr) << difference;
     }
     const auto original = boost::make_shared<L>(current.light);
-    const ByteVector record = recordOf(*original);
+    const ByteVector record = expectRoundTrip(original, [] { return boost::make_shared<L>(); });
     EXPECT_EQ(record, current.image.bytes);
-    const LightPtr copy = original->clone();
-    EXPECT_NE(copy.get(), original.get());
-    EXPECT_TRUE(copy->isEqual(original));
-    EXPECT_EQ(recordOf(*copy), record);
     // Only the version words, the placement's counts and text lengths may leave a changed record unreadable.
     EXPECT_GE(expectEveryStoredByteCompared(original, record, [] { return boost::make_shared<L>(); }) + 24,
               record.size());
@@ -279,14 +265,10 @@ void checkKind(Stored<L> (*stored)(int version)) {
     const std::pair<std::uint16_t, std::uint16_t> refused[] = {
         {0, 0}, {0, static_cast<std::uint16_t>(L::kInfo.version + 1)}, {0, 0xFFFF}, {1, L::kInfo.version}};
     for (const auto& [first, second] : refused) {
-        ByteVector image = record;
-        std::copy_n(Image{}.version(first, second).bytes.begin(), 4, image.begin());
         L light = current.light;
-        QuickArchive ar;
-        EXPECT_FALSE(readInto(light, image, &ar)) << first << "." << second;
-        ASSERT_TRUE(ar.failure());
-        EXPECT_EQ(ar.failure()->reason, "unknown " + std::string(L::kInfo.what) + " version (" +
-                                            std::to_string(first) + ", " + std::to_string(second) + ")");
+        expectReadFails(light, withVersion(record, first, second),
+                        "unknown " + std::string(L::kInfo.what) + " version (" + std::to_string(first) + ", " +
+                            std::to_string(second) + ") at offset 4");
         L defaults;
         if constexpr (std::is_same_v<L, SunLight>) defaults.identifier = light.identifier;
         EXPECT_EQ(record::firstDifference(light, defaults, L::recordFields()), nullptr);
@@ -305,17 +287,10 @@ TEST(LightRecord, EveryKindInEveryVersion) {
 }
 
 TEST(LightRecord, RefusesBrokenPlacementsAndOverlongTexts) {
-    MayaDirectLight direct;
-    ByteVector record = recordOf(direct);
-    record[record.size() - 48 - 8 - 4] = 4; // the placement's key-time size: 4 instead of 8
-    QuickArchive ar;
-    EXPECT_FALSE(readInto(direct, record, &ar));
-    EXPECT_TRUE(ar.failed());
-
-    SunLight sun;
-    record = recordOf(sun);
-    record[record.size() - 48 - 8 - 4 - 4 - 2] = 2; // the placement's version (0, 2)
-    EXPECT_FALSE(readInto(sun, record));
+    MayaDirectLight direct; // the placement's key-time size: 4 instead of 8
+    EXPECT_FALSE(readInto(direct, withWord(recordOf(direct), recordOf(direct).size() - 48 - 8 - 4, 4)));
+    SunLight sun; // the placement's version (0, 2)
+    EXPECT_FALSE(readInto(sun, withVersion(recordOf(sun), 0, 2, recordOf(sun).size() - 48 - 8 - 4 - 4 - 4)));
 
     Image ies; // version 1, its ies_file claiming more bytes than the archive holds
     ies.version(0, 1).put(Transform::identity()).put(Color{}).put(Color{}).put(Color{}).f32({0, 0});
@@ -330,7 +305,7 @@ TEST(LightRecord, RefusesBrokenPlacementsAndOverlongTexts) {
 // top of the document, whatever the path; the sphere light has none.
 TEST(LightXml, AssetsOfEveryKind) {
     OmniLight omni;
-    omni.transform = Transform{Matrix{{{0, 1, 0}, {-1, 0, 0}, {0, 0, 2}}}, Vector{10, 20, 30}};
+    omni.transform = kPlacement;
     omni.color = {0.5f, 0.25f, 1.0f}, omni.shadowBias = 0.125f, omni.decay = 2.0f, omni.shadowRadius = 0.75f;
     omni.units = 3, omni.shadows = false, omni.affectSpecular = false, omni.photonSubdivs = 4294967295u;
     expectGolden(xmlOf(omni, "/Sky"), "light_omni.xml");
