@@ -1,7 +1,7 @@
 #pragma once
 // Helpers shared by the material tests: a clean scene library around every test,
-// named materials of any kind, and the byte images of TextureTestSupport.
-#include "TextureTestSupport.hpp"
+// named materials of any kind, and the shared record helpers.
+#include "TrimSupport.hpp"
 
 #include <dexmor/materials/Materials.hpp>
 
@@ -13,8 +13,8 @@
 namespace materialtest {
 
 using namespace OrvexKavorCore;
-using texturetest::ByteVector;
-using texturetest::Image;
+using testsupport::ByteVector;
+using testsupport::Image;
 
 // The library is process-wide: every test starts and ends with it empty.
 class LibraryTest : public ::testing::Test {
@@ -45,7 +45,7 @@ inline MaterialPtr readStored(const ByteVector& bytes, std::string* why = nullpt
     QuickArchive ar(bytes.data(), bytes.size());
     MaterialPtr m;
     const bool ok = readMember(ar, m);
-    if (why) *why = texturetest::failureOf(ar);
+    if (why) *why = testsupport::failureOf(ar);
     if (!ok) return {};
     EXPECT_EQ(ar.readPosition(), bytes.size());
     return m;

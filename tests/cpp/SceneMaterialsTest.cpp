@@ -34,7 +34,7 @@ ByteVector libraryRecord(std::initializer_list<const char*> names,
 bool readLibrary(SceneMaterials& lib, const ByteVector& bytes, std::string* why = nullptr) {
     QuickArchive ar(bytes.data(), bytes.size());
     const bool ok = lib.readFromArchive(ar);
-    if (why) *why = texturetest::failureOf(ar);
+    if (why) *why = testsupport::failureOf(ar);
     return ok;
 }
 
