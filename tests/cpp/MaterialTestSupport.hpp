@@ -24,11 +24,17 @@ protected:
     SceneMaterials& library() { return *SceneMaterials::instance(); }
 };
 
-template <class Kind>
-boost::shared_ptr<Kind> make(const std::string& name) {
+// A material of `Kind` named `name`, with `set` applied to it.
+template <class Kind, class Set>
+boost::shared_ptr<Kind> make(const std::string& name, Set set) {
     auto m = boost::make_shared<Kind>();
     m->name = name;
+    set(*m);
     return m;
+}
+template <class Kind>
+boost::shared_ptr<Kind> make(const std::string& name) {
+    return make<Kind>(name, [](Kind&) {});
 }
 
 // The record of a material as stored in a file: kind id, then the record.
