@@ -264,26 +264,16 @@ TEST(BRDFRecord, GlassKeepsItsFieldsThroughItsRead) {
     expectSameBase(layer, Glass_BRDF());
 }
 
+// (Failing textures, strings and first halves of version words in any record:
+// the texture, archive and hostile-input tests.)
 TEST(BRDFRecord, RefusedRecordsSayWhy) {
     const ByteVector diffuse = Image{}.f32({1, 1, 1, 0, 0, 0, 1, 1}).bytes;
-    const struct {
-        std::int32_t kind;
-        ByteVector bytes;
-        const char* reason;
-    } cases[] = {
-        {2, Image{}.version(0, 4).append(diffuse).bytes, "unknown diffuse BRDF version (0, 4)"},
-        {1, Image{}.version(1, 6).bytes, "unknown glass BRDF version (1, 6)"},
-        {2, Image{}.version(0, 3).append(diffuse).flag(true).i32(41).bytes,
-         "colorTex / texture: unknown texture kind 41"},
-        {2, Image{}.version(0, 2).append(diffuse).flag(false).flag(true).i32(-1).bytes,
-         "transparencyTex / texture: unknown texture kind -1"},
-        {32, Image{}.version(0, 5).f32({1, 1, 1, 0, 0, 0, 1, 1, 1, 1}).flag(true).i32(1).version(0, 9).bytes,
-         "unknown Fresnel texture version (0, 9)"},
-        {2, Image{}.version(0, 3).append(diffuse).flag(false).flag(false).version(0, 5).bytes,
-         "base record: unknown BRDF base record version (0, 5)"},
-        {2, Image{}.version(0, 1).append(diffuse).u32(50000).bytes, "a string of 50000 bytes"},
-    };
-    for (const auto& c : cases) expectReadFails(*createBRDF(c.kind), c.bytes, c.reason);
+    Diffuse_BRDF layer;
+    expectReadFails(layer, Image{}.version(0, 4).append(diffuse).bytes, "unknown diffuse BRDF version (0, 4)");
+    expectReadFails(layer, Image{}.version(0, 3).append(diffuse).flag(true).i32(41).bytes,
+                    "colorTex / texture: unknown texture kind 41");
+    expectReadFails(layer, Image{}.version(0, 3).append(diffuse).flag(false).flag(false).version(0, 5).bytes,
+                    "base record: unknown BRDF base record version (0, 5)");
 }
 
 // --- XML ---
