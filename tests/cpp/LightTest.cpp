@@ -34,41 +34,10 @@ AnimatedTransform animatedPlacement() {
     return a;
 }
 
-// The placement a record stores as a plain Transform: its value at time 0.
-AnimatedTransform plainPlacement() {
-    AnimatedTransform a;
-    a.setValue(kPlacement, 0.0);
-    return a;
-}
-
-// The record of one version, assembled by hand, and the light it reads to: the
-// defaults with the values the record holds. Each call names a field and its stored
-// type; numbers take the next of 1, 2, 3 ..., so that a value read into another
-// field, or a field read from another place, shows; flags take a value that differs
-// from the default where the version allows.
+// The record of one version, assembled by hand, and the light it reads to; flags
+// take a value that differs from the default where the version allows.
 template <class L>
-struct Stored {
-    Image image;
-    L light;
-    float next = 0;
-    explicit Stored(int version) { image.version(0, static_cast<std::uint16_t>(version)); }
-
-    template <class T>
-    Stored& put(T L::*field, const T& value) {
-        light.*field = value;
-        image.put(value);
-        return *this;
-    }
-    Stored& c(Color L::*m) { return put(m, Color{next + 1, next + 2, next + 3}), next += 3, *this; }
-    Stored& v(Vector L::*m) { return put(m, Vector{next + 1, next + 2, next + 3}), next += 3, *this; }
-    Stored& f(float L::*m) { return put(m, ++next); }
-    Stored& i(std::int32_t L::*m) { return put(m, static_cast<std::int32_t>(++next)); }
-    Stored& u(std::uint32_t L::*m) { return put(m, static_cast<std::uint32_t>(++next)); }
-    Stored& b(bool L::*m, bool value) { return put(m, value); }
-    // The placement stored as a plain Transform, read as its value at time 0.
-    Stored& plain(AnimatedTransform L::*m) { return image.put(kPlacement), light.*m = plainPlacement(), *this; }
-    Stored& keyed(AnimatedTransform L::*m) { return put(m, animatedPlacement()); }
-};
+using Stored = Assembled<L>;
 
 Stored<MayaDirectLight> directional(int v) {
     using L = MayaDirectLight;
@@ -78,8 +47,8 @@ Stored<MayaDirectLight> directional(int v) {
     s.f(&L::shadowBias).f(&L::md_f1).f(&L::md_f2).u(&L::causticSubdivs).u(&L::photonSubdivs).i(&L::md_i1);
     s.b(&L::enabled, false);
     if (v >= 2) s.b(&L::shadows, false).u(&L::shadowSubdivs).f(&L::shadowRadius);
-    if (v == 2) s.plain(&L::transform);
-    if (v >= 3) s.keyed(&L::transform);
+    if (v == 2) s.plain(&L::transform, kPlacement);
+    if (v >= 3) s.put(&L::transform, animatedPlacement());
     return s;
 }
 
@@ -153,13 +122,13 @@ Stored<SphereLight> sphere(int v) {
 Stored<SunLight> sun(int v) {
     using L = SunLight;
     Stored<L> s(v);
-    if (v <= 3) s.plain(&L::transform);
+    if (v <= 3) s.plain(&L::transform, kPlacement);
     s.v(&L::up_vector).f(&L::shadowBias).f(&L::turbidity).f(&L::water_vapour).f(&L::intensity_multiplier);
     s.f(&L::size_multiplier).f(&L::photon_radius).f(&L::photon_emit_distance).f(&L::ozone);
     s.i(&L::photonSubdivs).i(&L::causticSubdivs).i(&L::shadow_subdivs).b(&L::shadows, false);
     if (v >= 2) s.put(&L::identifier, std::string("{5a1e-1d}")).put(&L::name, std::string("Soleil d'\xC3\xA9t\xC3\xA9"));
     if (v >= 3) s.b(&L::enabled, false).b(&L::invisible, true);
-    if (v >= 4) s.keyed(&L::transform);
+    if (v >= 4) s.put(&L::transform, animatedPlacement());
     return s;
 }
 
@@ -205,19 +174,19 @@ void checkKind(Stored<L> (*stored)(int version)) {
     for (int v = 1; v <= L::kInfo.version; ++v) {
         SCOPED_TRACE("version " + std::to_string(v));
         Stored<L> old = stored(v);
-        L read = current.light;
+        L read = current.object;
         ASSERT_TRUE(readInto(read, old.image.bytes));
         if constexpr (std::is_same_v<L, SunLight>) {
             if (v == 1) {
                 EXPECT_FALSE(read.identifier.empty());
-                EXPECT_NE(read.identifier, current.light.identifier);
-                old.light.identifier = read.identifier;
+                EXPECT_NE(read.identifier, current.object.identifier);
+                old.object.identifier = read.identifier;
             }
         }
-        const char* difference = record::firstDifference(read, old.light, L::recordFields());
+        const char* difference = record::firstDifference(read, old.object, L::recordFields());
         EXPECT_EQ(difference, nullptr) << difference;
     }
-    const auto original = boost::make_shared<L>(current.light);
+    const auto original = boost::make_shared<L>(current.object);
     const ByteVector record = expectRoundTrip(original, [] { return boost::make_shared<L>(); });
     EXPECT_EQ(record, current.image.bytes);
     // Only the version words, the placement's counts and text lengths may leave a changed record unreadable.
@@ -227,7 +196,7 @@ void checkKind(Stored<L> (*stored)(int version)) {
     const std::pair<std::uint16_t, std::uint16_t> refused[] = {
         {0, 0}, {0, static_cast<std::uint16_t>(L::kInfo.version + 1)}, {0, 0xFFFF}, {1, L::kInfo.version}};
     for (const auto& [first, second] : refused) {
-        L light = current.light;
+        L light = current.object;
         expectReadFails(light, withVersion(record, first, second),
                         "unknown " + std::string(L::kInfo.what) + " version (" + std::to_string(first) + ", " +
                             std::to_string(second) + ") at offset 4");

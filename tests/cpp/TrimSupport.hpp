@@ -51,4 +51,36 @@ inline ByteVector withVersion(ByteVector bytes, std::uint16_t first, std::uint16
     return withWord(std::move(bytes), at, first | std::uint32_t{second} << 16);
 }
 
+// A record assembled by hand and the object it reads to: the defaults with the
+// values the record holds. Each call names a field and its stored type; numbers
+// take the next of 1, 2, 3 ..., so that a value read into another field, or a
+// field read from another place, shows.
+template <class T>
+struct Assembled {
+    Image image;
+    T object;
+    float next = 0;
+    explicit Assembled(int version) { image.version(0, static_cast<std::uint16_t>(version)); }
+
+    template <class V>
+    Assembled& put(V T::*field, const V& value) {
+        object.*field = value;
+        image.put(value);
+        return *this;
+    }
+    Assembled& c(OrvexKavorCore::Color T::*m) { return put(m, {next + 1, next + 2, next + 3}), next += 3, *this; }
+    Assembled& v(OrvexKavorCore::Vector T::*m) { return put(m, {next + 1, next + 2, next + 3}), next += 3, *this; }
+    Assembled& f(float T::*m) { return put(m, ++next); }
+    Assembled& i(std::int32_t T::*m) { return put(m, static_cast<std::int32_t>(++next)); }
+    Assembled& u(std::uint32_t T::*m) { return put(m, static_cast<std::uint32_t>(++next)); }
+    Assembled& b(bool T::*m, bool value) { return put(m, value); }
+    // A keyed value stored as its plain value, read as the value at time 0.
+    template <class K, class V>
+    Assembled& plain(K T::*m, const V& value) {
+        image.put(value);
+        (object.*m).setValue(value, 0.0);
+        return *this;
+    }
+};
+
 } // namespace testsupport
