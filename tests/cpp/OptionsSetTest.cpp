@@ -204,7 +204,7 @@ TEST(AllOptions, RejectedRecordsSayWhy) {
     using Append = void (*)(QuickArchive&);
     const Append nothing = [](QuickArchive&) {};
     // The record under `word`, up to the field `stopAt` (all of it for nullptr),
-    // then `append`.
+    // then `append`. (A channel count beyond the data: HostileInputTest.)
     const std::tuple<VersionWord, const char*, Append, std::string> cases[] = {
         {VersionWord::make(1, 10), nullptr, nothing, "unknown options version (1, 10)"},
         {VersionWord::make(1, 15), nullptr, nothing, "unknown options version (1, 15)"},
@@ -215,10 +215,6 @@ TEST(AllOptions, RejectedRecordsSayWhy) {
          "camera: unknown physical camera version (0, 3)"},
         {VersionWord::make(1, 23), "bg_tex", [](QuickArchive& ar) { ar.write(true), ar.write(std::int32_t{41}); },
          "bg_tex / texture: unknown texture kind 41"},
-        {VersionWord::make(1, 23), "gi_tex", [](QuickArchive& ar) { ar.write(true), ar.write(std::int32_t{-1}); },
-         "gi_tex / texture: unknown texture kind -1"},
-        {VersionWord::make(1, 23), "channels", [](QuickArchive& ar) { ar.write(std::uint32_t{0x40000000}); },
-         "channels: 1073741824 channel ids do not fit in the"},
     };
     for (const auto& [word, stopAt, append, failure] : cases) {
         QuickArchive ar = assemble(source, 23, word, stopAt);
