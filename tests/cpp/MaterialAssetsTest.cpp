@@ -1,14 +1,11 @@
 // Folding material trees into the assets of a material library document: golden
-// XML for each rule, the searches (through the library, around cycles) and whole
-// files of all three generations.
+// XML for each rule, the searches (through the library, around cycles), and the
+// unfolded assets of every kind. (Whole files of the three generations: the
+// framing in FileContainerTest, the conversion in ConversionTest.)
 #include "MaterialTestSupport.hpp"
 
-#include <dexmor/dexmor.hpp>
-#include <dexmor/files/ZelMatFile.hpp>
 #include <dexmor/brdfs/BRDFs.hpp>
 #include <dexmor/textures/Textures.hpp>
-
-#include <sstream>
 
 using namespace materialtest;
 using namespace testsupport;
@@ -160,33 +157,6 @@ TEST_F(FoldingTest, CyclesThroughTheLibrary) {
     EXPECT_FALSE(back->heldMaterial);
     QuickArchive ar;
     EXPECT_TRUE(library().writeToArchive(ar));
-}
-
-// A library file in each generation converts to one "<Assets>" block per material.
-TEST_F(FoldingTest, WholeFilesInAllThreeGenerations) {
-    // A count of 10 stores a 0x0A byte, which a generation-1 file stores as 0x0D 0x0A.
-    auto twoSided = make<Material2Sided>("TenLetters", [](auto& m) { m.front = make<MaterialLayeredBRDF>("Front"); });
-    const MaterialPtr materials[] = {bumpAround("Bump", make<MaterialLayeredBRDF>("Inner"), 2.0f), twoSided};
-    ZelMatFile file;
-    std::string payload;
-    for (const MaterialPtr& m : materials) {
-        file.add(m);
-        const ByteVector stored = storedForm(m);
-        payload.append(stored.begin(), stored.end());
-    }
-    ASSERT_EQ(payload.find('\x0D'), std::string::npos);
-    ASSERT_NE(payload.find('\x0A'), std::string::npos);
-    std::string generation1;
-    for (char c : payload) generation1 += c == '\x0A' ? std::string("\x0D\x0A") : std::string(1, c);
-    std::ostringstream generation3;
-    ASSERT_TRUE(file.writeToStream(generation3));
-    const auto header = [](std::uint16_t generation) {
-        const ByteVector bytes = Image{}.version(0, generation).u32(2).bytes;
-        return std::string(bytes.begin(), bytes.end());
-    };
-    for (const std::string& content : {header(1) + generation1, header(2) + payload, generation3.str()})
-        EXPECT_EQ(convertBytesToXml(FileKind::MaterialLibrary, content),
-                  materialToXml(materials[0]) + materialToXml(materials[1]));
 }
 
 // --- the unfolded assets (a material's own writeXml) ---
