@@ -1,16 +1,10 @@
 // Keyed values, the animated parameters that present them to the renderer, and
 // their use in record tables.
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
 #include <dexmor/archive/Record.hpp>
 #include <dexmor/params/AnimatedParams.hpp>
 #include <dexmor/params/AnimatedValues.hpp>
-
-#include <gtest/gtest.h>
-
-#include <array>
-#include <limits>
-#include <vector>
 
 using namespace OrvexKavorCore;
 using namespace testsupport;

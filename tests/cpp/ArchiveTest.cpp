@@ -1,14 +1,7 @@
 // The archive's byte layouts, its chunking, and its guards against damaged data.
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
 #include <dexmor/archive/Record.hpp>
-
-#include <gtest/gtest.h>
-
-#include <array>
-#include <sstream>
-#include <tuple>
-#include <vector>
 
 using namespace OrvexKavorCore;
 using namespace testsupport;

@@ -6,15 +6,6 @@
 #include <dexmor/brdfs/BRDFs.hpp>
 #include <dexmor/textures/Textures.hpp>
 
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
-#include <array>
-#include <climits>
-#include <cstdint>
-#include <random>
-#include <string>
-
 using namespace OrvexKavorCore;
 using namespace testsupport;
 

@@ -3,13 +3,6 @@
 
 #include <dexmor/textures/BitmapBuffer.hpp>
 
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
-#include <cstdint>
-#include <random>
-#include <string>
-
 using namespace OrvexKavorCore;
 using namespace testsupport;
 

@@ -5,11 +5,6 @@
 #include <dexmor/options/PhysicalCamera.hpp>
 #include <dexmor/options/RenderView.hpp>
 
-#include <gtest/gtest.h>
-
-#include <climits>
-#include <string>
-
 using namespace OrvexKavorCore;
 using namespace testsupport;
 

@@ -1,16 +1,12 @@
 // The framing of material library and render-options files, the pass-through of
 // files that are not binary, and saving without losing the previous file.
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
 #include <dexmor/dexmor.hpp>
 #include <dexmor/files/ZelMatFile.hpp>
 #include <dexmor/files/ZelOptFile.hpp>
 
-#include <gtest/gtest.h>
-
 #include <filesystem>
-#include <fstream>
-#include <sstream>
 #include <sys/stat.h>
 
 using namespace OrvexKavorCore;

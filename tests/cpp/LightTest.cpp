@@ -8,13 +8,6 @@
 #include <dexmor/lights/LightKinds.hpp>
 #include <dexmor/lights/SunLight.hpp>
 
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
-#include <climits>
-#include <cstdint>
-#include <map>
-#include <string>
 #include <type_traits>
 
 using namespace OrvexKavorCore;

@@ -6,13 +6,6 @@
 #include <dexmor/params/NestedListParams.hpp>
 #include <dexmor/params/SerialListParams.hpp>
 
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
-#include <string>
-#include <tuple>
-#include <vector>
-
 using namespace OrvexKavorCore;
 using namespace testsupport;
 

@@ -7,10 +7,6 @@
 #include <dexmor/textures/BitmapBuffer.hpp>
 #include <dexmor/textures/Textures.hpp>
 
-#include <climits>
-#include <functional>
-#include <random>
-
 using namespace materialtest;
 using namespace testsupport;
 

@@ -5,11 +5,6 @@
 
 #include <dexmor/materials/Materials.hpp>
 
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
-#include <string>
-
 namespace materialtest {
 
 using namespace OrvexKavorCore;

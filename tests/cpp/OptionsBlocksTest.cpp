@@ -7,15 +7,7 @@
 #include <dexmor/options/OrvexParams.hpp>
 #include <dexmor/options/OrvexVFBStampInfo.hpp>
 
-#include <gtest/gtest.h>
-
 #include <algorithm>
-#include <array>
-#include <bit>
-#include <map>
-#include <random>
-#include <string>
-#include <vector>
 
 using namespace OrvexKavorCore;
 using namespace testsupport;

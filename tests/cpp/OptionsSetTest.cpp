@@ -9,14 +9,7 @@
 #include <dexmor/options/AllOptions.hpp>
 #include <dexmor/textures/SkyTexture.hpp>
 
-#include <gtest/gtest.h>
-
-#include <random>
 #include <span>
-#include <string>
-#include <tuple>
-#include <vector>
-
 
 using namespace OrvexKavorCore;
 using namespace testsupport;

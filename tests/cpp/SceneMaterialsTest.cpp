@@ -5,9 +5,7 @@
 #include <dexmor/brdfs/BRDFs.hpp>
 
 #include <atomic>
-#include <sstream>
 #include <thread>
-#include <vector>
 
 using namespace materialtest;
 

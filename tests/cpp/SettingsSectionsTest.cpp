@@ -1,16 +1,10 @@
 // The XML document of an options set: the twenty-one settings sections as golden
 // documents, and what single parameters show for chosen values.
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
 #include <dexmor/files/ConversionContext.hpp>
 #include <dexmor/options/AllOptions.hpp>
 #include <dexmor/textures/SkyTexture.hpp>
-
-#include <gtest/gtest.h>
-
-#include <functional>
-#include <string>
-#include <tuple>
 
 using namespace OrvexKavorCore;
 using namespace testsupport;

@@ -5,13 +5,8 @@
 #include <dexmor/files/ConversionContext.hpp>
 #include <dexmor/textures/SkyTexture.hpp>
 
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
 #include <cctype>
-#include <string>
 #include <thread>
-#include <tuple>
 
 using namespace OrvexKavorCore;
 using namespace testsupport;

@@ -6,17 +6,6 @@
 #include <dexmor/textures/Textures.hpp>
 #include <dexmor/textures/UVWGenerators.hpp>
 
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
-#include <array>
-#include <climits>
-#include <cmath>
-#include <cstdint>
-#include <functional>
-#include <random>
-#include <string>
-
 using namespace OrvexKavorCore;
 using namespace testsupport;
 

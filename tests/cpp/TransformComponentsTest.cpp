@@ -3,8 +3,6 @@
 
 #include <dexmor/params/TransformComponents.hpp>
 
-#include <gtest/gtest.h>
-
 using namespace OrvexKavorCore;
 using namespace testsupport;
 

@@ -1,11 +1,27 @@
 #pragma once
 // Checks that most record tests share: a whole round trip of an object and its copy,
-// a read that must fail for a given reason, and a record with one word replaced.
+// a read that must fail for a given reason, a record with one word replaced, and a
+// record assembled field by field with the object it reads to. Also the headers
+// every record test uses.
 #include "TestSupport.hpp"
 
+#include <boost/make_shared.hpp>
+#include <gtest/gtest.h>
+
+#include <array>
+#include <climits>
+#include <cstdint>
 #include <cstring>
+#include <functional>
+#include <limits>
+#include <map>
+#include <random>
+#include <sstream>
 #include <string>
 #include <string_view>
+#include <tuple>
+#include <utility>
+#include <vector>
 
 namespace testsupport {
 

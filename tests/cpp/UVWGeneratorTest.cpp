@@ -4,14 +4,6 @@
 
 #include <dexmor/textures/UVWGenerators.hpp>
 
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
-#include <climits>
-#include <cstdint>
-#include <random>
-#include <string>
-
 using namespace OrvexKavorCore;
 using namespace testsupport;
 

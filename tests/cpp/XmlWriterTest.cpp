@@ -3,14 +3,9 @@
 // lists, and the escaping rules.
 #include <dexmor/xml/AssetXmlWriter.hpp>
 
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
 #include <dexmor/textures/ColorTextures.hpp>
-
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
-#include <string>
 
 using namespace OrvexKavorCore;
 using testsupport::expectGolden;
