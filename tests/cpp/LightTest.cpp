@@ -3,7 +3,6 @@
 #include "TrimSupport.hpp"
 
 #include <dexmor/archive/Members.hpp>
-#include <dexmor/files/ConversionContext.hpp>
 #include <dexmor/lights/BaseLight.hpp>
 #include <dexmor/lights/LightKinds.hpp>
 #include <dexmor/lights/SunLight.hpp>
@@ -250,7 +249,6 @@ TEST(LightXml, AssetsOfEveryKind) {
 }
 
 TEST(SunLightXml, OneAssetPerIdentifierNamedInWritingOrder) {
-    const ConversionContext context;
     std::string out;
     AssetXmlWriter writer(out);
     SunLight first("A", "{id-a}"), second("B", "{id-b}"), third("C", "{id-c}");

@@ -164,7 +164,6 @@ TEST(AllOptions, RandomSetsRoundTripAtVersion23) {
 
 TEST(AllOptions, OlderRecordsReadWithDefaultsForTheRowsTheyLack) {
     std::mt19937 rng(1999);
-    const ConversionContext fresh2;
     AllOptions source = randomOptions(rng);
     source.reflect_tex = createTexture(BaseTexture::kChecker);
     for (const unsigned version : kAcceptedVersions) {
@@ -264,7 +263,6 @@ TEST(AllOptions, FileNamesKeepAtMost2047Utf16Units) {
 // (A file's framing in archive chunks: FileContainerTest.)
 TEST(AllOptions, AnOptionsFileConvertsToTheDocumentOfItsSet) {
     std::mt19937 rng(77);
-    const ConversionContext fresh3;
     AllOptions o = randomOptions(rng);
     o.gi_tex = createTexture(BaseTexture::kSky), o.reflect_tex = createTexture(BaseTexture::kSky);
     QuickArchive ar(1);

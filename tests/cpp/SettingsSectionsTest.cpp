@@ -2,7 +2,6 @@
 // documents, and what single parameters show for chosen values.
 #include "TrimSupport.hpp"
 
-#include <dexmor/files/ConversionContext.hpp>
 #include <dexmor/options/AllOptions.hpp>
 #include <dexmor/textures/SkyTexture.hpp>
 
@@ -40,7 +39,6 @@ std::string parameterOf(const std::string& xml, const std::string& url, const st
 } // namespace
 
 TEST(Settings, DefaultDocumentGolden) {
-    const ConversionContext fresh1;
     AllOptions options;
     const std::string xml = documentOf(options);
     expectGolden(xml, "options_default.xml");
@@ -48,7 +46,6 @@ TEST(Settings, DefaultDocumentGolden) {
 }
 
 TEST(Settings, EnvironmentTexturesGolden) {
-    const ConversionContext fresh2;
     AllOptions options;
     options.bg_tex = createTexture(BaseTexture::kChecker), options.gi_tex = createTexture(BaseTexture::kSky);
     options.reflect_tex = createTexture(BaseTexture::kSky), options.refract_tex = createTexture(BaseTexture::kFresnel);

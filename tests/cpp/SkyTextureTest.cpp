@@ -1,5 +1,7 @@
 // The sky texture: its three record versions, its sun, the shared default sun
-// (per conversion and per thread) and its XML with the document's sun map.
+// (per conversion and per thread) and its XML with the document's sun map. Every
+// test starts from a pristine default sun (FreshContextPerTest), as every
+// conversion does.
 #include "TrimSupport.hpp"
 
 #include <dexmor/files/ConversionContext.hpp>
@@ -12,13 +14,6 @@ using namespace OrvexKavorCore;
 using namespace testsupport;
 
 namespace {
-
-// Every sky test starts from a pristine default sun, as every conversion does.
-class Sky : public ::testing::Test {
-protected:
-    ConversionContext context;
-};
-using SkyXml = Sky;
 
 SunLight& sunOf(const SkyTexture& sky) { return dynamic_cast<SunLight&>(*sky.sun); }
 
@@ -39,7 +34,7 @@ void expectFieldsOfTheImage(const SkyTexture& s) {
 
 } // namespace
 
-TEST_F(Sky, NewSkiesShareTheDefaultSunAndHaveTheirOwnIdentifiers) {
+TEST(Sky, NewSkiesShareTheDefaultSunAndHaveTheirOwnIdentifiers) {
     const auto defaultSun = sharedDefaultSun();
     EXPECT_EQ(defaultSun->name + " " + defaultSun->identifier, "Default {D3BE9766-E4AA-418b-81A9-23414A2BA98D}");
     SkyTexture a, b;
@@ -49,7 +44,7 @@ TEST_F(Sky, NewSkiesShareTheDefaultSunAndHaveTheirOwnIdentifiers) {
     for (char c : a.identifier) EXPECT_FALSE(std::isupper(static_cast<unsigned char>(c))) << a.identifier;
 }
 
-TEST_F(Sky, Version1HoldsOnlyTheSun) {
+TEST(Sky, Version1HoldsOnlyTheSun) {
     SunLight stored("Noon", "{0A0B}");
     stored.turbidity = 5;
     SkyTexture read;
@@ -64,7 +59,7 @@ TEST_F(Sky, Version1HoldsOnlyTheSun) {
     EXPECT_EQ(withoutSun.sun.get(), sharedDefaultSun().get());
 }
 
-TEST_F(Sky, Versions2And3) {
+TEST(Sky, Versions2And3) {
     // Version 3: own sun, the fields, the keyed placement, the default sun, whether
     // the sky's sun is the default sun. Read and written back byte for byte.
     SunLight own("Noon", "{0A0B}");
@@ -97,7 +92,7 @@ TEST_F(Sky, Versions2And3) {
     EXPECT_EQ(recordOf(read), v3.bytes);
 }
 
-TEST_F(Sky, Version3OverwritesTheSharedDefaultSunAndCanPointAtIt) {
+TEST(Sky, Version3OverwritesTheSharedDefaultSunAndCanPointAtIt) {
     // A record written while the default sun held other numbers.
     sharedDefaultSun()->turbidity = 7.5f;
     SkyTexture writer;
@@ -122,7 +117,7 @@ TEST_F(Sky, Version3OverwritesTheSharedDefaultSunAndCanPointAtIt) {
     EXPECT_EQ(sunOf(read).turbidity, 7.5f);
 }
 
-TEST_F(Sky, DefaultSunBelongsToItsThread) {
+TEST(Sky, DefaultSunBelongsToItsThread) {
     sharedDefaultSun()->turbidity = 9;
     float seen = 0;
     const void* seenSun = nullptr;
@@ -138,7 +133,7 @@ TEST_F(Sky, DefaultSunBelongsToItsThread) {
 }
 
 // A sun with the default sun's identifier, in any case, is stored as the default sun.
-TEST_F(Sky, ALookalikeOfTheDefaultSunIsStoredAsTheDefaultSunInBothPlaces) {
+TEST(Sky, ALookalikeOfTheDefaultSunIsStoredAsTheDefaultSunInBothPlaces) {
     // Found by fuzzing: the own sun record held the lookalike's numbers while the
     // record pointed at the default sun, so a saved sky read back to other numbers.
     SkyTexture sky;
@@ -160,7 +155,7 @@ TEST_F(Sky, ALookalikeOfTheDefaultSunIsStoredAsTheDefaultSunInBothPlaces) {
     EXPECT_EQ(recordOf(bare)[4], 0);
 }
 
-TEST_F(Sky, AFailedSunReadIsIgnoredButOtherFailuresAreNot) {
+TEST(Sky, AFailedSunReadIsIgnoredButOtherFailuresAreNot) {
     // The sun record carries a version no sun knows; the sky reads on.
     SkyTexture sky;
     QuickArchive ar;
@@ -176,7 +171,7 @@ TEST_F(Sky, AFailedSunReadIsIgnoredButOtherFailuresAreNot) {
         expectReadFails(sky, Image{}.version(0, refused).bytes, "unknown sky texture version");
 }
 
-TEST_F(Sky, CopiesGetNewIdentifiersAndComparisonIgnoresTheirCase) {
+TEST(Sky, CopiesGetNewIdentifiersAndComparisonIgnoresTheirCase) {
     const auto sky = boost::make_shared<SkyTexture>();
     sky->sun = boost::make_shared<SunLight>("Noon", "{0A0B}");
     const TexturePtr a = sky->clone();
@@ -195,7 +190,7 @@ TEST_F(Sky, CopiesGetNewIdentifiersAndComparisonIgnoresTheirCase) {
 
 // A sky writes its sun's asset (at the top of the document) before its own; one
 // sun asset per identifier in a document, the next one named "/SunLight1".
-TEST_F(SkyXml, SkyWithItsSunAndOneSunAssetPerIdentifier) {
+TEST(SkyXml, SkyWithItsSunAndOneSunAssetPerIdentifier) {
     SkyTexture sky;
     SkyTexture bare;
     bare.sun.reset();
