@@ -1,5 +1,5 @@
-// The renderer's parameter interface: plain answers, extension interfaces and the
-// typed lists.
+// The renderer's parameter interface: extension interfaces and the typed lists.
+// (The plain interface's neutral answers are constants of its declaration.)
 #include <dexmor/params/PluginParameter.hpp>
 
 #include <gtest/gtest.h>
@@ -27,17 +27,6 @@ private:
 };
 
 } // namespace
-
-// The answers a renderer takes for "nothing here": no list, zeros, null.
-TEST(ParamInterface, PlainParameterGivesNeutralAnswers) {
-    PlainParam p;
-    EXPECT_TRUE(p.elementCount(3.0) == -1 && p.enterList(2) == 0u && p.elementType() == 10000);
-    EXPECT_TRUE(p.getInt(1, 2.0) == 0 && p.getDouble() == 0.0 && p.getVector() == Vector{} && p.getAColor() == AColor{});
-    EXPECT_EQ(p.getTransform(), Transform::zero());
-    EXPECT_TRUE(p.getString() == nullptr && p.getObject(0, 0.0, 1) == nullptr);
-    EXPECT_TRUE(p.getIntList().empty() && p.getVectorList().empty());
-    EXPECT_FALSE(p.setFloat(1));
-}
 
 TEST(ParamInterface, ExtensionInterfacesAreFoundByIdLatestFirst) {
     PlainParam p;

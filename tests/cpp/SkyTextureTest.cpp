@@ -35,8 +35,7 @@ void expectFieldsOfTheImage(const SkyTexture& s) {
 } // namespace
 
 TEST(Sky, NewSkiesShareTheDefaultSunAndHaveTheirOwnIdentifiers) {
-    const auto defaultSun = sharedDefaultSun();
-    EXPECT_EQ(defaultSun->name + " " + defaultSun->identifier, "Default {D3BE9766-E4AA-418b-81A9-23414A2BA98D}");
+    const auto defaultSun = sharedDefaultSun(); // (its identifier: the lookalike test)
     SkyTexture a, b;
     EXPECT_TRUE(a.sun == defaultSun && b.sun == defaultSun);
     EXPECT_NE(a.identifier, b.identifier);
