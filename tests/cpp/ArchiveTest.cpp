@@ -1,13 +1,7 @@
 // The archive's byte layouts, its chunking, and its guards against damaged data.
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
 #include <dexmor/archive/Record.hpp>
-
-#include <gtest/gtest.h>
-
-#include <array>
-#include <sstream>
-#include <vector>
 
 using namespace OrvexKavorCore;
 using namespace testsupport;
@@ -27,35 +21,23 @@ TEST(Archive, PrimitivesAreLittleEndianAndPacked) {
     ar.write(1.0);
     const auto bytes = bytesOf(ar);
     EXPECT_EQ(bytes, Image{}.f32({1, 0, 0, 0, 1, 0, 0, 0, 1, 1, 2, 3}).version(0, 3).flag(true).i32(-2).f64(1.0).bytes);
-    EXPECT_EQ((ByteVector(bytes.begin(), bytes.begin() + 4)), (ByteVector{0x00, 0x00, 0x80, 0x3F})); // 1.0f
     EXPECT_EQ((ByteVector(bytes.begin() + 48, bytes.begin() + 57)),
               (ByteVector{0, 0, 3, 0, 1, 0xFE, 0xFF, 0xFF, 0xFF})); // version word, bool, -2
-
     QuickArchive back = archiveOver(bytes);
     EXPECT_EQ(back.get<Transform>(), (Transform{Matrix::identity(), Vector{1, 2, 3}}));
     EXPECT_EQ(back.get<VersionWord>(), VersionWord::make(0, 3));
-    EXPECT_TRUE(back.get<bool>());
-    EXPECT_EQ(back.get<std::int32_t>(), -2);
-    EXPECT_EQ(back.get<double>(), 1.0);
-}
-
-TEST(Archive, AnyNonZeroBoolByteReadsTrue) {
-    QuickArchive ar = archiveOver({0x00, 0x01, 0x02, 0xFF});
-    EXPECT_FALSE(ar.get<bool>());
-    EXPECT_TRUE(ar.get<bool>());
-    EXPECT_TRUE(ar.get<bool>());
-    EXPECT_TRUE(ar.get<bool>());
+    EXPECT_TRUE(back.get<bool>() && back.get<std::int32_t>() == -2 && back.get<double>() == 1.0);
+    // Any non-zero byte reads as true.
+    QuickArchive flags = archiveOver({0x00, 0x02, 0xFF});
+    EXPECT_TRUE(!flags.get<bool>() && flags.get<bool>() && flags.get<bool>());
 }
 
 TEST(Archive, StringsAreCutAtTheirFirstNul) {
     QuickArchive ar = archiveOver({0, 0, 0, 0, 4, 0, 0, 0, 'a', 'b', 0, 'c', 0x2A});
-    std::string s = "old";
-    ASSERT_TRUE(ar.readString(s));
-    EXPECT_EQ(s, "");
-    ASSERT_TRUE(ar.readString(s));
-    EXPECT_EQ(s, "ab");
-    EXPECT_EQ(ar.readPosition(), 12u);
-    EXPECT_EQ(ar.get<std::uint8_t>(), 0x2A);
+    std::string empty = "old", s;
+    ASSERT_TRUE(ar.readString(empty) && ar.readString(s));
+    EXPECT_TRUE(empty.empty() && s == "ab");
+    EXPECT_EQ(ar.get<std::uint8_t>(), 0x2A); // after the whole stored string
 }
 
 TEST(Archive, WideStringsAreUtf8WithAWindows1252Fallback) {
@@ -68,21 +50,14 @@ TEST(Archive, WideStringsAreUtf8WithAWindows1252Fallback) {
     EXPECT_EQ(bytes[0], 9u); // UTF-8 length
 
     QuickArchive back = archiveOver(bytes);
-    std::string s;
-    ASSERT_TRUE(back.readWString(s));
-    EXPECT_EQ(s, "Caf\xC3\xA9 \xE2\x82\xAC");
-    ASSERT_TRUE(back.readWString(s));
-    EXPECT_EQ(s, "Caf\xC3\xA9 \xE2\x82\xAC");
-    ASSERT_TRUE(back.readWString(s));
-    EXPECT_EQ(s, "cut");
-    ASSERT_TRUE(back.readWString(s));
-    EXPECT_EQ(s, "");
+    std::string a, b, c, d = "old";
+    ASSERT_TRUE(back.readWString(a) && back.readWString(b) && back.readWString(c) && back.readWString(d));
+    EXPECT_EQ(std::tuple(a, b, c, d), std::tuple("Caf\xC3\xA9 \xE2\x82\xAC", "Caf\xC3\xA9 \xE2\x82\xAC", "cut", ""));
 }
 
 TEST(Archive, ChunksGrowByOneAndSaveWhole) {
-    QuickArchive empty(1);
     std::ostringstream emptyImage;
-    empty.save(emptyImage);
+    QuickArchive(1).save(emptyImage);
     EXPECT_EQ(emptyImage.str().size(), 4u + 4096u);
 
     QuickArchive ar(1);
@@ -102,8 +77,7 @@ TEST(Archive, ChunksGrowByOneAndSaveWhole) {
     loaded.skip(4094);
     std::uint8_t b[3] = {};
     EXPECT_TRUE(loaded.getRaw(b, 3));
-    EXPECT_EQ(b[0], static_cast<std::uint8_t>(4094));
-    EXPECT_EQ(b[2], static_cast<std::uint8_t>(4096));
+    EXPECT_TRUE(b[0] == static_cast<std::uint8_t>(4094) && b[2] == static_cast<std::uint8_t>(4096));
 }
 
 TEST(Archive, LoadRejectsTruncatedAndOversizedImages) {
@@ -120,11 +94,9 @@ TEST(Archive, ReadsPastTheEndKeepTheDestination) {
     QuickArchive ar = archiveOver({1, 0, 0, 0});
     ar.skip(4096); // past the only chunk
     std::int32_t i = 77;
-    ar.read(i);
-    EXPECT_EQ(i, 77);
     Color c{5, 5, 5};
-    ar.read(c); // compound values assemble into zeros
-    EXPECT_EQ(c, (Color{0, 0, 0}));
+    ar.read(i), ar.read(c); // compound values assemble into zeros
+    EXPECT_TRUE(i == 77 && c == (Color{0, 0, 0}));
     EXPECT_FALSE(ar.failed()); // a plain read past the end is not a failure
 }
 
@@ -136,12 +108,11 @@ TEST(Archive, BytesBlocksHonourTheStrictnessFlag) {
     ar.write(std::int32_t{99});
 
     std::array<std::uint8_t, 12> buffer{};
-    QuickArchive lax = ar;
+    QuickArchive lax = ar, strict = ar;
     EXPECT_EQ(lax.readBytes(buffer.data(), 12, false), 24u);
     EXPECT_EQ(buffer[11], 11);
     EXPECT_EQ(lax.get<std::int32_t>(), 99); // the surplus was skipped
 
-    QuickArchive strict = ar;
     EXPECT_EQ(strict.readBytes(buffer.data(), 12, true), 24u);
     EXPECT_EQ(strict.readPosition(), 0u); // back at the count
 }
@@ -152,17 +123,13 @@ TEST(Archive, CountsBeyondTheDataFailWithoutAllocating) {
     std::string s = "kept";
     EXPECT_FALSE(ar.readString(s));
     EXPECT_EQ(s, "kept");
-    ASSERT_TRUE(ar.failed());
-    EXPECT_EQ(ar.failure()->offset, 4u);
-    EXPECT_NE(ar.failure()->reason.find("4000000000"), std::string::npos);
+    EXPECT_NE(failureOf(ar).find("4000000000"), std::string::npos);
 
     QuickArchive block = archiveOver({0xFF, 0xFF, 0xFF, 0xFF});
     std::uint8_t b[4];
     EXPECT_FALSE(block.readBytes(b, 4, false).has_value());
-
     EXPECT_TRUE(QuickArchive(1).canHold(4096 / 8, 8));
-    EXPECT_FALSE(QuickArchive(1).canHold(4096 / 8 + 1, 8));
-    EXPECT_FALSE(QuickArchive(1).canHold(std::uint64_t{1} << 62, 8));
+    EXPECT_FALSE(QuickArchive(1).canHold(4096 / 8 + 1, 8) || QuickArchive(1).canHold(std::uint64_t{1} << 62, 8));
 }
 
 TEST(Archive, FailuresKeepTheFirstReasonAndTheRecordPath) {
@@ -187,10 +154,7 @@ TEST(Archive, NestingIsLimited) {
         scopes.push_back(std::make_unique<QuickArchive::Scope>(ar, "texture"));
         ASSERT_TRUE(*scopes.back());
     }
-    {
-        auto label = QuickArchive::Scope::label(ar, "a field"); // labels do not nest
-        EXPECT_TRUE(label);
-    }
+    EXPECT_TRUE(QuickArchive::Scope::label(ar, "a field")); // labels do not nest
     QuickArchive::Scope tooDeep(ar, "texture");
     EXPECT_FALSE(tooDeep);
     EXPECT_TRUE(ar.failed());
@@ -223,10 +187,7 @@ constexpr std::array<record::Field<Block>, 6> kBlockFields = {
 
 TEST(RecordTable, ReadsAndWritesTheFieldsOfEachVersion) {
     Block source;
-    source.group = {5, 2.5f};
-    source.color = {1, 2, 3};
-    source.file = "t\xC3\xBCr.png";
-    source.mode = 9;
+    source.group = {5, 2.5f}, source.color = {1, 2, 3}, source.file = "t\xC3\xBCr.png", source.mode = 9;
 
     QuickArchive ar;
     ASSERT_TRUE(record::writeFields(ar, source, kBlockFields, 3));
@@ -236,17 +197,11 @@ TEST(RecordTable, ReadsAndWritesTheFieldsOfEachVersion) {
     EXPECT_TRUE(record::fieldsEqual(source, back, kBlockFields));
 
     // Version 1 holds a discarded float and neither the amount nor the mode.
-    QuickArchive old;
-    old.write(std::int32_t{4});
-    old.write(9.5f);
-    old.write(Color{1, 1, 1});
-    old.writeWString("x");
+    const ByteVector v1 = Image{}.i32(4).f32({9.5f, 1, 1, 1}).text("x").bytes;
+    QuickArchive old = archiveOver(v1);
     Block fromOld;
     ASSERT_TRUE(record::readFields(old, fromOld, kBlockFields, 1));
-    EXPECT_EQ(fromOld.group.on, 4);
-    EXPECT_EQ(fromOld.group.amount, 1.0f);
-    EXPECT_EQ(fromOld.file, "x");
-    EXPECT_EQ(fromOld.mode, 7u);
+    EXPECT_TRUE(fromOld.group.on == 4 && fromOld.group.amount == 1.0f && fromOld.file == "x" && fromOld.mode == 7u);
 
     fromOld.mode = 8;
     EXPECT_STREQ(record::firstDifference(fromOld, Block{fromOld.group, fromOld.color, fromOld.file, 7, true},
@@ -255,11 +210,7 @@ TEST(RecordTable, ReadsAndWritesTheFieldsOfEachVersion) {
 }
 
 TEST(RecordTable, AFailingFieldNamesItselfInTheFailure) {
-    QuickArchive ar;
-    ar.write(std::int32_t{1});
-    ar.write(Color{});
-    ar.write(1.0f);
-    ar.write(std::uint32_t{0xFFFFFFF0}); // the file name's length
+    QuickArchive ar = archiveOver(Image{}.i32(1).f32({0, 0, 0, 1}).u32(0xFFFFFFF0).bytes); // the file name's length
     Block back;
     EXPECT_FALSE(record::readFields(ar, back, kBlockFields, 2));
     ASSERT_TRUE(ar.failed());

@@ -1,19 +1,10 @@
 // BRDF layers: the factory, every record version of every kind (assembled by hand
 // from random values), the Fresnel switch of the older reflection records,
 // comparison, copies and the XML assets.
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
 #include <dexmor/brdfs/BRDFs.hpp>
 #include <dexmor/textures/Textures.hpp>
-
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
-#include <array>
-#include <climits>
-#include <cstdint>
-#include <random>
-#include <string>
 
 using namespace OrvexKavorCore;
 using namespace testsupport;
@@ -171,21 +162,9 @@ void expectSameBase(const Base_BRDF& read, const B& expect) {
 
 } // namespace
 
+// (Each kind's plugin type and default name: the golden documents.)
 TEST(BRDF, FactoryKindsAndDefaults) {
-    const std::pair<std::int32_t, const char*> kinds[] = {
-        {1, "BRDFRefraction"}, {2, "BRDFDiffuse"},     {4, "BRDFReflection"},
-        {8, "BRDFReflection"}, {16, "BRDFReflection"}, {32, "BRDFLight"}};
-    for (const auto& [kind, plugin] : kinds) {
-        const BRDFPtr layer = createBRDF(kind);
-        ASSERT_TRUE(layer) << kind;
-        EXPECT_EQ(layer->kindId(), kind);
-        EXPECT_EQ(layer->pluginType(), plugin);
-        EXPECT_EQ(layer->assetType(), "BRDF");
-        EXPECT_EQ(layer->name, plugin);
-        EXPECT_TRUE(layer->flag1 && !layer->flag2 && !layer->flag3);
-    }
     for (std::int32_t kind : {0, 3, 6, 64, 128, -1, INT_MIN}) EXPECT_FALSE(createBRDF(kind)) << kind;
-
     // Each reflection layer has a Fresnel transparency of its own, and so has its copy.
     const auto mirror = boost::make_shared<Mirror_BRDF>();
     ASSERT_TRUE(dynamic_cast<FresnelTexture*>(mirror->transparencyTex.get()));
@@ -220,10 +199,8 @@ TEST(BRDFRecord, EveryVersionOfEveryKind) {
                 EXPECT_TRUE(read->isEqual(expect));
                 expectSameBase(*read, r.expect);
                 if (v < current) continue;
-                EXPECT_EQ(recordOf(*read), r.image.bytes);
+                EXPECT_EQ(expectRoundTrip(read, [] { return createBRDF(B::kInfo.kind); }), r.image.bytes);
                 const BRDFPtr copy = read->clone();
-                EXPECT_TRUE(copy->isEqual(read));
-                EXPECT_EQ(recordOf(*copy), r.image.bytes);
                 EXPECT_EQ(xmlOf(*copy, "/M"), xmlOf(*read, "/M"));
                 if (seed != 0) continue;
                 const ByteVector& bytes = r.image.bytes;
@@ -241,23 +218,13 @@ TEST(BRDFRecord, EveryVersionOfEveryKind) {
     });
 }
 
-TEST(BRDFRecord, PhongAndBlinnAreDifferentKindsWithTheSameXml) {
-    Layout<Phong_BRDF> r(6, 1);
-    glossy(r, 6);
-    const BRDFPtr phong = boost::make_shared<Phong_BRDF>(r.expect), blinn = createBRDF(Base_BRDF::kBlinn);
-    ASSERT_TRUE(readInto(*blinn, r.image.bytes));
-    EXPECT_FALSE(blinn->isEqual(phong));
-    EXPECT_EQ(xmlOf(*blinn, "/M"), xmlOf(*phong, "/M"));
-}
-
 TEST(BRDFRecord, MirrorFresnelSwitch) {
     // Version 1 with the switch on: a Fresnel texture of the stored index, whatever
     // the path; with the switch off the path decides.
     const auto mirrorV1 = [](std::int32_t on) {
-        Image image;
-        image.version(0, 1).f32({1, 1, 1, 1, 1, 1, 1, 1.6f, 0.01f}).i32(on).i32(1).text("C:/maps/a.png");
         Mirror_BRDF mirror;
-        EXPECT_TRUE(readInto(mirror, image.bytes));
+        const Image head = Image{}.version(0, 1).f32({1, 1, 1, 1, 1, 1, 1, 1.6f, 0.01f});
+        EXPECT_TRUE(readInto(mirror, Image(head).i32(on).i32(1).text("C:/maps/a.png").bytes));
         return mirror.transparencyTex;
     };
     const auto fresnel = boost::dynamic_pointer_cast<FresnelTexture>(mirrorV1(1));
@@ -268,10 +235,8 @@ TEST(BRDFRecord, MirrorFresnelSwitch) {
 
 TEST(BRDFRecord, GlassKeepsItsFieldsThroughItsRead) {
     Glass_BRDF layer;
-    layer.transparency = Color{0.25f, 0.5f, 0.75f};
-    layer.colorTex = boost::make_shared<AColorTexture>();
-    layer.name = "Old";
-    layer.flag1 = false;
+    layer.transparency = Color{0.25f, 0.5f, 0.75f}, layer.colorTex = boost::make_shared<AColorTexture>();
+    layer.name = "Old", layer.flag1 = false;
     Layout<Glass_BRDF> r(1, 1);
     glass(r, 1);
     ASSERT_TRUE(readInto(layer, r.image.bytes));
@@ -281,31 +246,16 @@ TEST(BRDFRecord, GlassKeepsItsFieldsThroughItsRead) {
     expectSameBase(layer, Glass_BRDF());
 }
 
+// (Failing textures, strings and first halves of version words in any record:
+// the texture, archive and hostile-input tests.)
 TEST(BRDFRecord, RefusedRecordsSayWhy) {
     const ByteVector diffuse = Image{}.f32({1, 1, 1, 0, 0, 0, 1, 1}).bytes;
-    const struct {
-        std::int32_t kind;
-        ByteVector bytes;
-        const char* reason;
-    } cases[] = {
-        {2, Image{}.version(0, 4).append(diffuse).bytes, "unknown diffuse BRDF version (0, 4)"},
-        {1, Image{}.version(1, 6).bytes, "unknown glass BRDF version (1, 6)"},
-        {2, Image{}.version(0, 3).append(diffuse).flag(true).i32(41).bytes,
-         "colorTex / texture: unknown texture kind 41"},
-        {2, Image{}.version(0, 2).append(diffuse).flag(false).flag(true).i32(-1).bytes,
-         "transparencyTex / texture: unknown texture kind -1"},
-        {32, Image{}.version(0, 5).f32({1, 1, 1, 0, 0, 0, 1, 1, 1, 1}).flag(true).i32(1).version(0, 9).bytes,
-         "unknown Fresnel texture version (0, 9)"},
-        {2, Image{}.version(0, 3).append(diffuse).flag(false).flag(false).version(0, 5).bytes,
-         "base record: unknown BRDF base record version (0, 5)"},
-        {2, Image{}.version(0, 1).append(diffuse).u32(50000).bytes, "a string of 50000 bytes"},
-    };
-    for (const auto& c : cases) {
-        const BRDFPtr layer = createBRDF(c.kind);
-        QuickArchive ar;
-        EXPECT_FALSE(readInto(*layer, c.bytes, &ar)) << c.reason;
-        EXPECT_NE(failureOf(ar).find(c.reason), std::string::npos) << failureOf(ar);
-    }
+    Diffuse_BRDF layer;
+    expectReadFails(layer, Image{}.version(0, 4).append(diffuse).bytes, "unknown diffuse BRDF version (0, 4)");
+    expectReadFails(layer, Image{}.version(0, 3).append(diffuse).flag(true).i32(41).bytes,
+                    "colorTex / texture: unknown texture kind 41");
+    expectReadFails(layer, Image{}.version(0, 3).append(diffuse).flag(false).flag(false).version(0, 5).bytes,
+                    "base record: unknown BRDF base record version (0, 5)");
 }
 
 // --- XML ---
@@ -316,14 +266,11 @@ TEST(BRDFRecord, RefusedRecordsSayWhy) {
 TEST(BRDFXml, AssetsOfEveryKind) {
     const TexturePtr tex = boost::make_shared<AColorTexture>(AColor{0.25f, 0.5f, 1.0f, 1.0f});
     Diffuse_BRDF diffuse;
-    diffuse.name = "A&B";
-    diffuse.colorTex = tex;
+    diffuse.name = "A&B", diffuse.colorTex = tex;
     Glass_BRDF glass;
-    glass.colorTex = tex;
-    glass.affectAlpha = -2;
+    glass.colorTex = tex, glass.affectAlpha = -2;
     Mirror_BRDF mirror;
-    mirror.transparencyTex.reset();
-    mirror.colorTex = tex;
+    mirror.transparencyTex.reset(), mirror.colorTex = tex;
     Phong_BRDF phong;
     Blinn_BRDF blinn;
     Light_BRDF light;
@@ -332,6 +279,7 @@ TEST(BRDFXml, AssetsOfEveryKind) {
     expectGolden(xmlOf(glass, "/M"), "brdf_glass.xml");
     expectGolden(xmlOf(mirror, "/M"), "brdf_mirror.xml");
     expectGolden(xmlOf(phong, "/M"), "brdf_glossy.xml");
-    expectGolden(xmlOf(blinn, "/M"), "brdf_glossy.xml");
+    expectGolden(xmlOf(blinn, "/M"), "brdf_glossy.xml"); // another kind with the same document
+    EXPECT_FALSE(boost::make_shared<Phong_BRDF>()->isEqual(boost::make_shared<Blinn_BRDF>()));
     expectGolden(xmlOf(light, "/M"), "brdf_light.xml");
 }

@@ -1,57 +1,51 @@
 // The physical camera and the render view: their records of every version,
 // assembled here byte by byte, and the render view's asset.
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
 #include <dexmor/options/PhysicalCamera.hpp>
 #include <dexmor/options/RenderView.hpp>
-
-#include <gtest/gtest.h>
-
-#include <climits>
-#include <string>
 
 using namespace OrvexKavorCore;
 using namespace testsupport;
 
 namespace {
 
-// A keyed value's record with one key at time 0 (the time's eight bytes are 0).
-ByteVector constantReal(float v) { return Image{}.version(0, 1).u32(1).u32(8).flag(true).u32(0).u32(0).f32({v}).bytes; }
-ByteVector constantInt(std::int32_t v) { return Image{}.version(0, 1).u32(1).u32(8).flag(true).u32(0).u32(0).i32(v).bytes; }
+// A keyed value's record with one key at time 0.
+ByteVector constantReal(float v) { return Image{}.version(0, 1).u32(1).u32(8).flag(true).f64(0).f32({v}).bytes; }
+ByteVector constantInt(std::int32_t v) { return Image{}.version(0, 1).u32(1).u32(8).flag(true).f64(0).i32(v).bytes; }
 
-// A camera record with distinct values in every row; `focal` and `focus` are the
-// stored forms of the two keyed values.
-ByteVector cameraRecord(std::uint16_t version, const ByteVector& focal, const ByteVector& focus) {
-    return Image{}.version(0, version).i32(1).f32({35}).append(focal)        // type, film_width, focal_length
-        .f32({1.5f, -0.25f, 5.6f, 0.125f, 60, 90, -0.5f, 0.01f, 400})       // zoom_factor .. ISO
-        .i32(1).append(focus).i32(1).f32({150, 0.3f})                        // specify_focus .. dof_display_threshold
-        .i32(0).f32({0.9f, 0.8f, 0.7f}).i32(0).i32(1).i32(7)                  // exposure .. blades_num
-        .f32({45, 0.2f, -0.1f}).i32(1).i32(1).i32(12)                        // blades_rotation .. subdivs
-        .bytes;
-}
-
-PhysicalCamera cameraOfTheRecord(float focal, float focus) {
-    PhysicalCamera c;
-    c.type = 1, c.film_width = 35, c.zoom_factor = 1.5f, c.distortion = -0.25f, c.f_number = 5.6f;
-    c.lens_shift = 0.125f, c.shutter_speed = 60, c.shutter_angle = 90, c.shutter_offset = -0.5f, c.latency = 0.01f;
-    c.ISO = 400, c.specify_focus = 1, c.targeted = 1, c.target_distance = 150, c.dof_display_threshold = 0.3f;
-    c.exposure = 0, c.white_balance = Color{0.9f, 0.8f, 0.7f}, c.vignetting = 0, c.blades_enable = 1;
-    c.blades_num = 7, c.blades_rotation = 45, c.center_bias = 0.2f, c.anisotropy = -0.1f, c.use_dof = 1;
-    c.use_moblur = 1, c.subdivs = 12;
-    c.focal_length.setConstant(focal);
-    c.focus_distance.setConstant(focus);
-    return c;
+// A camera record with distinct values in every row and the camera it reads to.
+// Version 1 stores focal length and focus distance as plain numbers, version 2 as
+// keyed values.
+PhysicalCamera cameraOfTheRecord(int version, ByteVector* record) {
+    using C = PhysicalCamera;
+    Assembled<C> s(version);
+    const auto keyed = [&](AnimatedReal C::*m, float value) {
+        if (version == 1) return s.plain(m, value), void();
+        s.image.append(constantReal(value));
+        (s.object.*m).setValue(value, 0.0);
+    };
+    s.i(&C::type).f(&C::film_width);
+    keyed(&C::focal_length, 50.0f);
+    s.f(&C::zoom_factor).f(&C::distortion).f(&C::f_number).f(&C::lens_shift).f(&C::shutter_speed);
+    s.f(&C::shutter_angle).f(&C::shutter_offset).f(&C::latency).f(&C::ISO).i(&C::specify_focus);
+    keyed(&C::focus_distance, 321.0f);
+    s.i(&C::targeted).f(&C::target_distance).f(&C::dof_display_threshold).i(&C::exposure).c(&C::white_balance);
+    s.i(&C::vignetting).i(&C::blades_enable).i(&C::blades_num).f(&C::blades_rotation).f(&C::center_bias);
+    s.f(&C::anisotropy).i(&C::use_dof).i(&C::use_moblur).i(&C::subdivs);
+    *record = s.image.bytes;
+    return s.object;
 }
 
 } // namespace
 
 TEST(Camera, BothVersionsReadEveryRow) {
-    // Version 1 stores focal length and focus distance as plain numbers.
-    const auto plain = [](float v) { return Image{}.f32({v}).bytes; };
+    ByteVector version1, version2;
+    const PhysicalCamera expected = cameraOfTheRecord(1, &version1);
+    EXPECT_TRUE(expected.isEqual(cameraOfTheRecord(2, &version2)));
     PhysicalCamera camera;
-    ASSERT_TRUE(readInto(camera, cameraRecord(1, plain(50.0f), plain(321.0f))));
-    EXPECT_TRUE(camera.isEqual(cameraOfTheRecord(50.0f, 321.0f))) << camera.firstDifference(cameraOfTheRecord(50, 321));
-    const ByteVector version2 = cameraRecord(2, constantReal(50.0f), constantReal(321.0f));
+    ASSERT_TRUE(readInto(camera, version1));
+    EXPECT_TRUE(camera.isEqual(expected)) << camera.firstDifference(expected);
     EXPECT_EQ(recordOf(camera), version2);
 
     // Version 2 keeps keyed values with several keys.
@@ -61,32 +55,24 @@ TEST(Camera, BothVersionsReadEveryRow) {
     PhysicalCamera back;
     ASSERT_TRUE(readInto(back, recordOf(camera)));
     EXPECT_TRUE(back.isEqual(camera)) << back.firstDifference(camera);
-    EXPECT_EQ(back.focal_length.keyCount(), 2);
-    EXPECT_EQ(back.focus_distance.valueAt(-1.0), 1.0f);
-
+    EXPECT_TRUE(back.focal_length.keyCount() == 2 && back.focus_distance.valueAt(-1.0) == 1.0f);
     const CameraPtr copy = back.clone();
-    EXPECT_EQ(copy->kindId(), 0);
-    EXPECT_TRUE(dynamic_cast<const PhysicalCamera&>(*copy).isEqual(camera));
+    EXPECT_TRUE(copy->kindId() == 0 && dynamic_cast<const PhysicalCamera&>(*copy).isEqual(camera));
     copy->resetToDefaults();
     EXPECT_TRUE(dynamic_cast<const PhysicalCamera&>(*copy).isEqual(PhysicalCamera{}));
-    EXPECT_EQ(PhysicalCamera().focal_length.valueAt(0.0), 40.0f);
-    EXPECT_EQ(PhysicalCamera().focus_distance.valueAt(0.0), 200.0f);
 }
 
 TEST(Camera, RejectedRecords) {
-    const ByteVector good = constantReal(1.0f);
+    ByteVector record;
+    cameraOfTheRecord(2, &record);
     const std::pair<ByteVector, std::string> cases[] = {
-        {cameraRecord(3, good, good), "unknown physical camera version (0, 3)"},
-        {cameraRecord(0, good, good), "unknown physical camera version (0, 0)"},
-        {Image{}.version(1, 2).append(cameraRecord(2, good, good)).bytes, "unknown physical camera version (1, 2)"},
-        {cameraRecord(2, Image{}.version(0, 2).bytes, good), "focal_length: unknown animated real version"},
+        {withVersion(record, 0, 3), "unknown physical camera version (0, 3)"},
+        {withVersion(record, 0, 0), "unknown physical camera version (0, 0)"},
+        {withVersion(record, 1, 2), "unknown physical camera version (1, 2)"},
+        {withVersion(record, 0, 2, 12), "focal_length: unknown animated real version"},
     };
-    for (const auto& [bytes, failure] : cases) {
-        PhysicalCamera camera;
-        QuickArchive ar;
-        EXPECT_FALSE(readInto(camera, bytes, &ar));
-        EXPECT_TRUE(failureOf(ar).starts_with(failure)) << failureOf(ar);
-    }
+    PhysicalCamera camera;
+    for (const auto& [bytes, failure] : cases) expectReadFails(camera, bytes, failure);
 }
 
 // --- render view ---
@@ -118,12 +104,9 @@ TEST(RenderView, EveryVersionReadsTheSameView) {
     for (const auto& [bytes, animI1] : cases) {
         RenderView view;
         ASSERT_TRUE(readInto(view, bytes));
-        EXPECT_EQ(view.box1, (IntBox{10, 20, 110, 220}));
-        EXPECT_EQ(view.box1.width(), 100);
-        EXPECT_EQ(view.box1.height(), 200);
+        EXPECT_TRUE(view.box1 == (IntBox{10, 20, 110, 220}) && view.box1.width() == 100 && view.box1.height() == 200);
         EXPECT_EQ(view.box2, (IntBox{-5, 0, 5, 2}));
-        EXPECT_EQ(view.img_height, 480);
-        EXPECT_EQ(view.anim_r3.valueAt(0.0), 3.0f);
+        EXPECT_TRUE(view.img_height == 480 && view.anim_r3.valueAt(0.0) == 3.0f);
         EXPECT_EQ(view.transform.valueAt(0.0), (Transform{Matrix{{{0, 1, 0}, {-1, 0, 0}, {0, 0, 1}}}, Vector{4, 5, 6}}));
         EXPECT_EQ(view.anim_i1.valueAt(0.0), animI1);
         view.anim_i1.setConstant(1);
@@ -131,22 +114,17 @@ TEST(RenderView, EveryVersionReadsTheSameView) {
     }
 }
 
-TEST(RenderView, DefaultsBoxesAndRejectedVersions) {
-    const RenderView defaults;
-    EXPECT_EQ(defaults.box1.width(), 0);
-    EXPECT_EQ(defaults.box1.height(), 0);
-    EXPECT_EQ(defaults.anim_r1.valueAt(0.0), 0.7853982f);
+TEST(RenderView, BoxesAndRejectedVersions) {
     // Corners further apart than 32 bits can tell wrap around instead of overflowing.
     EXPECT_EQ((IntBox{INT_MIN, 0, INT_MAX, 5}).width(), -1);
 
     for (const auto& [first, second] : {std::pair<std::uint16_t, std::uint16_t>{0, 4}, {0, 0}, {1, 3}}) {
         RenderView view;
         view.img_width = 1;
-        QuickArchive ar;
-        EXPECT_FALSE(readInto(view, Image{}.version(first, second).append(boxes()).bytes, &ar));
+        expectReadFails(view, Image{}.version(first, second).append(boxes()).bytes,
+                        "unknown render view version (" + std::to_string(first) + ", " + std::to_string(second) +
+                            ") at offset 4");
         EXPECT_TRUE(view.isEqual(RenderView{}));
-        EXPECT_EQ(failureOf(ar), "unknown render view version (" + std::to_string(first) + ", " +
-                                     std::to_string(second) + ") at offset 4");
     }
 }
 

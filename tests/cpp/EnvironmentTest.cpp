@@ -25,10 +25,8 @@ public:
 // Four slots told apart by their colours.
 ZelSequenceDataEnvironment fourColours() {
     ZelSequenceDataEnvironment environment;
-    environment.slots[0].color = Color{0, 0, 0};
-    environment.slots[1].color = Color{16, 16, 16};
-    environment.slots[2].color = Color{2, 2, 2};
-    environment.slots[3].color = Color{4, 4, 4};
+    const float grey[] = {0, 16, 2, 4};
+    for (int slot = 0; slot < 4; ++slot) environment.slots[slot].color = Color{grey[slot], grey[slot], grey[slot]};
     return environment;
 }
 
@@ -56,7 +54,6 @@ TEST(Environment, TextureTimesMultiplierOverridesTheColour) {
     KavorContext reflected{2};
     EXPECT_EQ(environment.computeEnvironment(reflected), (Color{1, 0.5f, 0.25f}));
     EXPECT_EQ(grey.askedFor, 2u);
-
     // The product is formed in double precision before it is rounded.
     environment.slots[ZelSequenceDataEnvironment::kFlag2Slot].multiplier = 3;
     grey.color = AColor{0.1f, 0.7f, 1e30f, 0};

@@ -1,17 +1,12 @@
 // The framing of material library and render-options files, the pass-through of
 // files that are not binary, and saving without losing the previous file.
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
 #include <dexmor/dexmor.hpp>
 #include <dexmor/files/ZelMatFile.hpp>
 #include <dexmor/files/ZelOptFile.hpp>
 
-#include <gtest/gtest.h>
-
-#include <cstring>
 #include <filesystem>
-#include <fstream>
-#include <sstream>
 #include <sys/stat.h>
 
 using namespace OrvexKavorCore;
@@ -47,18 +42,13 @@ std::string slurp(const fs::path& p) {
 }
 
 std::string header(std::uint16_t generation, std::uint32_t count, std::uint16_t first = 0) {
-    std::string h(8, '\0');
-    const VersionWord v = VersionWord::make(first, generation);
-    std::memcpy(h.data(), &v.raw, 4);
-    std::memcpy(h.data() + 4, &count, 4);
-    return h;
+    const auto bytes = testsupport::Image{}.version(first, generation).u32(count).bytes;
+    return {bytes.begin(), bytes.end()};
 }
 
-std::string archiveBytes(QuickArchive& ar) {
-    std::string out(ar.chunkCount() * QuickArchive::kChunkSize, '\0');
-    QuickArchive copy = ar;
-    copy.getRaw(out.data(), out.size());
-    return out;
+std::string archiveBytes(const QuickArchive& ar) {
+    const auto bytes = testsupport::bytesOf(ar);
+    return {bytes.begin(), bytes.end()};
 }
 
 // A material whose record always fails to write.
@@ -80,12 +70,10 @@ TEST(MaterialFile, FramingOfTheThreeGenerations) {
     auto gen1 = ZelMatFile::readFraming(header(1, 1) + run);
     auto gen2 = ZelMatFile::readFraming(header(2, 1) + run);
     ASSERT_TRUE(gen1 && gen2);
-    EXPECT_EQ(gen1->generation, 1);
-    EXPECT_EQ(gen1->count, 1u);
+    EXPECT_TRUE(gen1->generation == 1 && gen1->count == 1u);
     // Generation 1 loses every 0x0D byte, wherever it stands; generation 2 keeps them.
-    EXPECT_EQ(archiveBytes(gen1->archive).substr(0, 4), std::string("\x01\x0A\x02\x00", 4));
-    EXPECT_EQ(archiveBytes(gen2->archive).substr(0, 5), run);
-    EXPECT_EQ(gen2->archive.writePosition(), 5u);
+    EXPECT_EQ(archiveBytes(gen1->archive), "\x01\x0A\x02");
+    EXPECT_EQ(archiveBytes(gen2->archive), run);
 
     QuickArchive image(1);
     image.write(std::int32_t{42});
@@ -100,10 +88,8 @@ TEST(MaterialFile, UnusableHeadersAreRejectedWithAReason) {
     ReadFailure why;
     EXPECT_FALSE(ZelMatFile::readFraming(header(3, 0), &why));
     EXPECT_NE(why.reason.find("no materials"), std::string::npos);
-    EXPECT_FALSE(ZelMatFile::readFraming(header(3, 1, 1), &why)); // first half not 0
-    EXPECT_FALSE(ZelMatFile::readFraming(header(4, 1), &why));
-    EXPECT_FALSE(ZelMatFile::readFraming(header(0, 1), &why));
-    EXPECT_FALSE(ZelMatFile::readFraming("\x00\x00\x03", &why));
+    for (const std::string& bad : {header(3, 1, 1), header(4, 1), header(0, 1), std::string("\x00\x00\x03")})
+        EXPECT_FALSE(ZelMatFile::readFraming(bad, &why)); // the first half not 0, unknown generations, cut short
     EXPECT_FALSE(ZelMatFile::readFraming(header(3, 1) + std::string("\x01\x00\x00\x00", 4) + "short", &why));
     EXPECT_EQ(why.recordPath, "archive image");
 }
@@ -111,9 +97,7 @@ TEST(MaterialFile, UnusableHeadersAreRejectedWithAReason) {
 TEST(MaterialFile, AFailedReadKeepsTheListAndSaysWhy) {
     ZelMatFile file;
     file.add(MaterialPtr(new UnwritableMaterial));
-    std::string body(4, '\0');
-    const std::int32_t unknownKind = 15;
-    std::memcpy(body.data(), &unknownKind, 4);
+    const std::string body("\x0F\0\0\0", 4); // material kind 15
     EXPECT_FALSE(file.readFromBytes(header(2, 1) + body + std::string(8, '\0')));
     EXPECT_EQ(file.count(), 1u);
     ASSERT_TRUE(file.lastReadFailure());
@@ -123,11 +107,6 @@ TEST(MaterialFile, AFailedReadKeepsTheListAndSaysWhy) {
     EXPECT_FALSE(file.readFromBytes(header(1, 1) + "\r\r" + body.substr(0, 2) + "\r" + body.substr(2) +
                                     std::string(8, '\0')));
     EXPECT_EQ(file.lastReadFailure()->offset, 8u + 2 + 4 + 1);
-
-    // A count of materials that cannot fit in the file fails before any is read.
-    EXPECT_FALSE(file.readFromBytes(header(2, 4000000000u) + std::string(16, '\0')));
-    EXPECT_EQ(file.lastReadFailure()->describe(),
-              "header: a count of 4000000000 materials cannot fit in the file at offset 4");
 }
 
 TEST(MaterialFile, LookUpByIndexAndName) {
@@ -140,11 +119,8 @@ TEST(MaterialFile, LookUpByIndexAndName) {
     MaterialPtr found;
     EXPECT_EQ(file.indexOf("OAK"), 0);
     EXPECT_EQ(file.indexOf("\xC3\xA9tain"), -1); // non-ASCII case is not folded
-    EXPECT_TRUE(file.get("\xC3\x89TAIN", found));
+    EXPECT_TRUE(file.get("\xC3\x89TAIN", found) && found == file.materials[1]);
     EXPECT_FALSE(file.get(3, found));
-    std::vector<std::string> names;
-    file.names(names);
-    EXPECT_EQ(names.size(), 3u);
 }
 
 TEST(MaterialFile, AFailedSaveKeepsThePreviousFileAndComposesAMessage) {
@@ -168,25 +144,12 @@ TEST(MaterialFile, OpenModeProbe) {
     EXPECT_EQ(ZelMatFile::probeOpenMode(dir.file("b.zelmat", header(3, 1))), std::ios_base::in | std::ios_base::binary);
 }
 
-TEST(Conversion, ExtensionTest) {
-    EXPECT_TRUE(hasExtension("/a/b/lib.ZelMat", "zelmat"));
-    EXPECT_FALSE(hasExtension("/a/b/lib.zelmat.bak", "zelmat"));
-    EXPECT_FALSE(hasExtension("/a/b/lib.", "zelmat"));
-    EXPECT_FALSE(hasExtension("/a/b/lib", "zelmat"));
-    EXPECT_FALSE(hasExtension("/a/x.zelmat/lib", "zelmat")); // the dot of a directory runs on
-    EXPECT_EQ(fileKindOf("opts.ZELOPT"), FileKind::RenderOptions);
-    EXPECT_EQ(fileKindOf("lib.zelmat"), FileKind::MaterialLibrary);
-    EXPECT_FALSE(fileKindOf("readme.txt"));
-}
-
+// (The extension test and the encodings of passed-through text: tests/python/test_module.py.)
 TEST(Conversion, FilesThatAreNotBinaryPassThroughAsText) {
     TempDir dir;
     for (FileKind kind : {FileKind::MaterialLibrary, FileKind::RenderOptions}) {
         const std::string ext = "." + std::string(extensionOf(kind));
-        EXPECT_EQ(convertToXml(kind, dir.file("x" + ext, "<Assets>\n")), "<Assets>\n");
-        EXPECT_EQ(convertToXml(kind, dir.file("e" + ext, "")), "");
         EXPECT_EQ(convertToXml(kind, dir.file("n" + ext, std::string("ab\0cd", 5))), "ab");
-        EXPECT_EQ(convertToXml(kind, dir.file("w" + ext, "caf\xE9")), "caf\xC3\xA9");
         const std::string large(3'000'017, 'x'); // read into a buffer of huge pages
         EXPECT_EQ(convertToXml(kind, dir.file("l" + ext, large)), large);
         EXPECT_EQ(convertToXml(kind, dir.path() / ("missing" + ext)), "");
@@ -230,10 +193,8 @@ TEST(OptionsFile, TheFileIsTheArchiveChunks) {
     const fs::path a = dir.path() / "small.zelopt", b = dir.path() / "large.zelopt";
     ASSERT_TRUE(file.writeFile(small, a));
     ASSERT_TRUE(file.writeFile(large, b));
-    EXPECT_EQ(fs::file_size(a), 4096u);
-    EXPECT_EQ(fs::file_size(b), 8192u);
-    EXPECT_TRUE(file.readFile(small, a));
-    EXPECT_TRUE(file.readFile(large, b));
+    EXPECT_TRUE(fs::file_size(a) == 4096u && fs::file_size(b) == 8192u);
+    EXPECT_TRUE(file.readFile(small, a) && file.readFile(large, b));
 
     // Trailing chunks behind the record are ignored.
     std::ofstream(a, std::ios::app | std::ios::binary) << std::string(4096, 'x');

@@ -7,11 +7,8 @@
 #include <dexmor/textures/BitmapBuffer.hpp>
 #include <dexmor/textures/Textures.hpp>
 
-#include <climits>
-#include <functional>
-#include <random>
-
 using namespace materialtest;
+using namespace testsupport;
 
 namespace {
 
@@ -119,19 +116,19 @@ ByteVector baseRecord(const std::string& name, const std::string& id) {
     return Image().version(0, 2).text(name).text(id).bytes;
 }
 
-ByteVector storedBRDF(std::int32_t kind) {
-    QuickArchive ar;
-    EXPECT_TRUE(writeMember(ar, createBRDF(kind)));
-    ByteVector out(ar.writePosition());
-    ar.getRaw(out.data(), out.size());
-    return out;
-}
-
 template <class Kind>
 boost::shared_ptr<Kind> as(const MaterialPtr& m) {
     auto k = boost::dynamic_pointer_cast<Kind>(m);
     EXPECT_TRUE(k) << "not of the expected kind";
     return k;
+}
+
+// A check of a material that must be of `Kind`.
+template <class Kind, class Check>
+std::function<void(const MaterialPtr&)> on(Check check) {
+    return [check](const MaterialPtr& m) {
+        if (auto k = as<Kind>(m)) check(*k);
+    };
 }
 
 } // namespace
@@ -150,28 +147,22 @@ TEST_F(MaterialRecordsTest, RandomRoundTripsOfEveryKind) {
             const ByteVector bytes = storedForm(m);
             const MaterialPtr back = readStored(bytes);
             ASSERT_TRUE(back);
-            EXPECT_EQ(back->kindId(), kind);
-            EXPECT_EQ(back->name, m->name);
-            EXPECT_EQ(back->identifier, m->identifier);
+            EXPECT_TRUE(back->kindId() == kind && back->name == m->name && back->identifier == m->identifier);
             EXPECT_EQ(storedForm(back), bytes);
             if (kind == BaseMaterial::kInstance) continue; // never equal, by definition
-            EXPECT_TRUE(m->isEqual(back));
-            EXPECT_TRUE(back->isEqual(m));
-            EXPECT_TRUE(m->clone()->isEqual(m));
-            EXPECT_TRUE(m->cloneRenamed()->isEqual(m));
+            EXPECT_TRUE(m->isEqual(back) && back->isEqual(m));
+            EXPECT_TRUE(m->clone()->isEqual(m) && m->cloneRenamed()->isEqual(m));
         }
     }
 }
 
 TEST_F(MaterialRecordsTest, CurrentLayouts) {
-    using texturetest::recordOf;
     auto layered = make<MaterialLayeredBRDF>("L");
     const ByteVector base = baseRecord("L", "");
     EXPECT_EQ(recordOf(*layered), Image().version(0, 4).u32(0).i32(1).i32(0).i32(1).i32(1).append(base).i32(0).bytes);
 
     // The bump's multiplier comes first, its base material has no present flag.
-    auto bump = make<MaterialBump>("B");
-    bump->baseMtl = layered;
+    auto bump = make<MaterialBump>("B", [&](auto& m) { m.baseMtl = layered; });
     EXPECT_EQ(recordOf(*bump),
               Image().version(0, 3).f32({1}).flag(false).append(storedForm(layered)).append(baseRecord("B", "")).bytes);
     // The displaced record starts with the base record.
@@ -179,26 +170,23 @@ TEST_F(MaterialRecordsTest, CurrentLayouts) {
     EXPECT_EQ(recordOf(*displaced), Image().version(0, 2).append(baseRecord("D", "")).flag(false).flag(false)
                                         .f32({1, 0, 4}).i32(256).i32(1).i32(1).i32(1).bytes);
     // The object names stand before the base record, shortCircuit after it.
-    auto exclusion = make<MaterialObjectExclusion>("X");
-    exclusion->objects = {"a", "b", "c"};
+    auto exclusion = make<MaterialObjectExclusion>("X", [](auto& m) { m.objects = {"a", "b", "c"}; });
     EXPECT_EQ(recordOf(*exclusion), Image().version(0, 3).i32(0).flag(false).u32(3).text("a").text("b").text("c")
                                         .append(baseRecord("X", "")).flag(true).bytes);
 
-    auto linked = make<MaterialLinked>("K");
-    linked->linkedMaterial = layered;
-    linked->idData.setText("C:\\lib\\wood.zelmat");
+    auto linked = make<MaterialLinked>("K", [&](auto& m) {
+        m.linkedMaterial = layered, m.idData.setText("C:\\lib\\wood.zelmat");
+    });
     const ByteVector linkedBytes = Image().version(0, 1).version(0, 1).u32(1).text("C:\\lib\\wood.zelmat")
                                        .append(storedForm(layered)).append(baseRecord("K", "")).bytes;
     EXPECT_EQ(recordOf(*linked), linkedBytes);
-    MaterialLinked back;
-    ASSERT_TRUE(texturetest::readInto(back, linkedBytes));
-    EXPECT_TRUE(back.isEqual(linked));
+    EXPECT_TRUE(readStored(Image().i32(BaseMaterial::kLinked).append(linkedBytes).bytes)->isEqual(linked));
 }
 
 TEST_F(MaterialRecordsTest, OlderVersions) {
     ASSERT_TRUE(library().add(make<MaterialLayeredBRDF>("Oak")));
     const ByteVector inner = storedForm(make<MaterialLayeredBRDF>("inner"));
-    const ByteVector diffuse = storedBRDF(Base_BRDF::kDiffuse);
+    const ByteVector diffuse = Image().i32(Base_BRDF::kDiffuse).append(recordOf(*createBRDF(2))).bytes;
     const auto kind = [](std::int32_t k, std::uint16_t version) { return Image().i32(k).version(0, version); };
 
     const struct Case {
@@ -207,86 +195,64 @@ TEST_F(MaterialRecordsTest, OlderVersions) {
         std::function<void(const MaterialPtr&)> check;
     } cases[] = {
         {"layered 1: the name goes through the unique-name rule",
-         kind(1, 1).u32(1).append(diffuse).i32(0).i32(7).text("Oak").bytes,
-         [](const MaterialPtr& m) {
-             auto l = as<MaterialLayeredBRDF>(m);
-             EXPECT_EQ(l->name, "Oak1");
-             EXPECT_TRUE(l->layers.size() == 1 && l->doubleSided == 0 && l->option1 == 7 && l->option2 == 1);
-         }},
+         kind(1, 1).u32(1).append(diffuse).i32(0).i32(7).text("Oak").bytes, on<MaterialLayeredBRDF>([](auto& l) {
+             EXPECT_TRUE(l.name == "Oak1" && l.layers.size() == 1 && !l.doubleSided);
+             EXPECT_TRUE(l.option1 == 7 && l.option2 == 1);
+         })},
         {"layered 1: an empty name is DefaultMaterial", kind(1, 1).u32(0).i32(1).i32(0).text("").bytes,
-         [](const MaterialPtr& m) { EXPECT_EQ(m->name, "DefaultMaterial"); }},
+         on<MaterialLayeredBRDF>([](auto& l) { EXPECT_EQ(l.name, "DefaultMaterial"); })},
         {"layered 2: a taken name is kept", kind(1, 2).u32(0).i32(0).i32(5).append(baseRecord("Oak", "i")).bytes,
-         [](const MaterialPtr& m) {
-             EXPECT_EQ(m->name + m->identifier, "Oaki");
-             EXPECT_EQ(as<MaterialLayeredBRDF>(m)->option3, 1);
-         }},
+         on<MaterialLayeredBRDF>([](auto& l) { EXPECT_TRUE(l.name + l.identifier == "Oaki" && l.option3 == 1); })},
         {"layered 3", kind(1, 3).u32(0).i32(0).i32(0).i32(8).i32(9).version(0, 1).text("V1").bytes,
-         [](const MaterialPtr& m) {
-             auto l = as<MaterialLayeredBRDF>(m);
-             EXPECT_TRUE(l->option2 == 8 && l->option3 == 9 && l->option4 == 0 && l->name == "V1");
-         }},
-        {"single 1", kind(0, 1).i32(3).i32(4).text("Oak").append(diffuse).bytes,
-         [](const MaterialPtr& m) {
-             auto s = as<MaterialSingleBRDF>(m);
-             EXPECT_TRUE(s->name == "Oak1" && s->option2 == 4 && s->brdf && s->brdf->kindId() == Base_BRDF::kDiffuse);
-         }},
+         on<MaterialLayeredBRDF>([](auto& l) {
+             EXPECT_TRUE(l.option2 == 8 && l.option3 == 9 && l.option4 == 0 && l.name == "V1");
+         })},
+        {"single 1", kind(0, 1).i32(3).i32(4).text("Oak").append(diffuse).bytes, on<MaterialSingleBRDF>([](auto& s) {
+             EXPECT_TRUE(s.name == "Oak1" && s.option2 == 4 && s.brdf && s.brdf->kindId() == Base_BRDF::kDiffuse);
+         })},
         {"bump 1: a bitmap path", kind(3, 1).text("").text("maps/b.png").f32({2}).append(inner).bytes,
-         [](const MaterialPtr& m) {
-             auto b = as<MaterialBump>(m);
-             EXPECT_TRUE(b->name == "DefaultMaterial" && b->bumpTexMult == 2.0f && b->baseMtl->name == "inner");
-             auto bitmap = boost::dynamic_pointer_cast<BitmapTexture>(b->bumpTex);
-             ASSERT_TRUE(bitmap);
-             EXPECT_EQ(boost::dynamic_pointer_cast<BitmapBuffer>(bitmap->bitmap)->file, "maps/b.png");
-         }},
+         on<MaterialBump>([](auto& b) {
+             EXPECT_TRUE(b.name == "DefaultMaterial" && b.bumpTexMult == 2.0f && b.baseMtl->name == "inner");
+             EXPECT_TRUE(b.bumpTex && b.bumpTex->isEqual(makeBitmapTexture("maps/b.png")));
+         })},
         {"bump 1: no path, no texture", kind(3, 1).text("Oak").text("").f32({1}).append(inner).bytes,
-         [](const MaterialPtr& m) { EXPECT_TRUE(m->name == "Oak1" && !as<MaterialBump>(m)->bumpTex); }},
+         on<MaterialBump>([](auto& b) { EXPECT_TRUE(b.name == "Oak1" && !b.bumpTex); })},
         {"bump 2: the name as stored", kind(3, 2).text("Oak").f32({3}).flag(false).append(inner).bytes,
-         [](const MaterialPtr& m) { EXPECT_TRUE(m->name == "Oak" && as<MaterialBump>(m)->bumpTexMult == 3.0f); }},
+         on<MaterialBump>([](auto& b) { EXPECT_TRUE(b.name == "Oak" && b.bumpTexMult == 3.0f); })},
         {"displaced 1", kind(9, 1).append(baseRecord("D", "")).flag(true).append(inner).flag(false).f32({3}).bytes,
-         [](const MaterialPtr& m) {
-             auto d = as<MaterialDisplaced>(m);
-             EXPECT_TRUE(d->displaceTexMult == 3.0f && d->displaceEdgeLength == 4.0f && d->displaceMaxSubdivs == 256);
-         }},
+         on<MaterialDisplaced>([](auto& d) {
+             EXPECT_TRUE(d.displaceTexMult == 3.0f && d.displaceEdgeLength == 4.0f && d.displaceMaxSubdivs == 256);
+         })},
         {"object exclusion 1", kind(10, 1).i32(1).flag(false).u32(2).text("a").text("b").bytes,
-         [](const MaterialPtr& m) {
-             auto x = as<MaterialObjectExclusion>(m);
-             EXPECT_TRUE(x->objects.size() == 2 && x->shortCircuit && x->name == "DefaultMaterial");
-         }},
+         on<MaterialObjectExclusion>([](auto& x) {
+             EXPECT_TRUE(x.objects.size() == 2 && x.shortCircuit && x.name == "DefaultMaterial");
+         })},
         {"object exclusion 2", kind(10, 2).i32(0).flag(false).u32(0).append(baseRecord("X", "")).bytes,
-         [](const MaterialPtr& m) { EXPECT_TRUE(m->name == "X" && as<MaterialObjectExclusion>(m)->shortCircuit); }},
+         on<MaterialObjectExclusion>([](auto& x) { EXPECT_TRUE(x.name == "X" && x.shortCircuit); })},
         {"toon 1",
          kind(14, 1).flag(false).f32({2, 1}).flag(false).f32({0.5f, 1}).flag(false).f32({0.1f, 1}).flag(false)
              .f32({0.2f, 0.3f, 0.4f, 1}).flag(false).f32({0.9f, 0.01f, 0.6f, 2}).flag(false).flag(true)
              .append(baseRecord("T", "")).bytes,
-         [](const MaterialPtr& m) {
-             auto t = as<MaterialToon>(m);
-             EXPECT_EQ(t->lineColor, (Color{0.2f, 0.3f, 0.4f}));
-             EXPECT_TRUE(t->lineWidth == 2.0f && t->lineUnits == 2.0f && t->divideByDist);
-             EXPECT_TRUE(!t->doSilhouetteMult && t->silhouetteMult == 1.5f);
-         }},
+         on<MaterialToon>([](auto& t) {
+             EXPECT_TRUE(t.lineColor == (Color{0.2f, 0.3f, 0.4f}) && t.lineWidth == 2.0f && t.lineUnits == 2.0f);
+             EXPECT_TRUE(t.divideByDist && !t.doSilhouetteMult && t.silhouetteMult == 1.5f);
+         })},
         {"multi 1", kind(2, 1).u32(1).append(inner).text("Oak").bytes,
-         [](const MaterialPtr& m) {
-             EXPECT_TRUE(m->name == "Oak1" && as<MaterialMulti>(m)->subMaterials.size() == 1);
-         }},
+         on<MaterialMulti>([](auto& m) { EXPECT_TRUE(m.name == "Oak1" && m.subMaterials.size() == 1); })},
         {"two-sided 1",
          kind(5, 1).flag(true).append(inner).flag(false).flag(false).f32({0.5f, 0.5f, 0.5f, 2}).flag(true).bytes,
-         [](const MaterialPtr& m) {
-             auto t = as<Material2Sided>(m);
-             EXPECT_TRUE(t->front->name == "inner" && t->translucency.g == 0.5f && t->force1Sided);
-             EXPECT_TRUE(t->transparency == Color{} && t->transparencyTexMult == 1.0f);
-         }},
+         on<Material2Sided>([](auto& t) {
+             EXPECT_TRUE(t.front->name == "inner" && t.translucency.g == 0.5f && t.force1Sided);
+             EXPECT_TRUE(t.transparency == Color{} && t.transparencyTexMult == 1.0f);
+         })},
         {"two-sided 2",
-         kind(5, 2).flag(false).flag(false).flag(false).f32({0, 0, 0, 1}).flag(false)
-             .flag(false).f32({1, 1, 1, 3}).bytes,
-         [](const MaterialPtr& m) {
-             auto t = as<Material2Sided>(m);
-             EXPECT_TRUE(t->transparency == (Color{1, 1, 1}) && t->transparencyTexMult == 3.0f);
-         }},
+         kind(5, 2).flag(false).flag(false).flag(false).f32({0, 0, 0, 1}).flag(false).flag(false).f32({1, 1, 1, 3})
+             .bytes,
+         on<Material2Sided>([](auto& t) {
+             EXPECT_TRUE(t.transparency == (Color{1, 1, 1}) && t.transparencyTexMult == 3.0f);
+         })},
         {"reference 1", kind(13, 1).append(baseRecord("R", "")).text("id-x").bytes,
-         [](const MaterialPtr& m) {
-             auto r = as<MaterialReference>(m);
-             EXPECT_TRUE(r->targetId == "id-x" && !r->heldMaterial);
-         }},
+         on<MaterialReference>([](auto& r) { EXPECT_TRUE(r.targetId == "id-x" && !r.heldMaterial); })},
     };
     for (const Case& c : cases) {
         SCOPED_TRACE(c.label);
@@ -302,40 +268,34 @@ TEST_F(MaterialRecordsTest, BaseRecordAndRefusedVersions) {
     // reads the identifier.
     MaterialInstance instance;
     instance.name = "before";
-    ASSERT_TRUE(texturetest::readInto(instance, Image().version(0, 1).append(baseRecord("", "id")).bytes));
-    EXPECT_EQ(instance.name, "DefaultMaterial");
-    EXPECT_EQ(instance.identifier, "id");
-    QuickArchive ar;
-    EXPECT_FALSE(texturetest::readInto(instance, Image().version(0, 1).version(0, 3).text("x").bytes, &ar));
-    EXPECT_EQ(ar.failure()->reason, "unknown base material record version (0, 3)");
+    ASSERT_TRUE(readInto(instance, Image().version(0, 1).append(baseRecord("", "id")).bytes));
+    EXPECT_EQ(instance.name + " " + instance.identifier, "DefaultMaterial id");
+    expectReadFails(instance, Image().version(0, 1).version(0, 3).text("x").bytes,
+                    "unknown base material record version (0, 3)");
     // The link identifier inside a linked material's record has versions of its own.
     MaterialLinked linked;
-    QuickArchive linkAr;
-    EXPECT_FALSE(texturetest::readInto(linked, Image().version(0, 1).version(0, 2).u32(2).i32(5).bytes, &linkAr));
-    EXPECT_EQ(linkAr.failure()->reason, "unknown link identifier version (0, 2)");
+    expectReadFails(linked, Image().version(0, 1).version(0, 2).u32(2).i32(5).bytes,
+                    "unknown link identifier version (0, 2)");
 
     // Every kind refuses versions beyond its own, versions 0 and a first half other than 0.
     Random rnd(7);
     for (std::int32_t kind = 0; kind < BaseMaterial::kKindCount; ++kind) {
-        ByteVector bytes = storedForm(rnd.material(kind, 0));
+        const ByteVector bytes = storedForm(rnd.material(kind, 0));
         const std::uint16_t current = static_cast<std::uint16_t>(bytes[6] | bytes[7] << 8);
-        for (const std::uint32_t bad : {VersionWord::make(0, current + 1).raw, VersionWord::make(0, 0).raw,
-                                        VersionWord::make(1, current).raw}) {
-            for (int i = 0; i < 4; ++i) bytes[4 + i] = static_cast<std::uint8_t>(bad >> (8 * i));
+        using Word = std::pair<std::uint16_t, std::uint16_t>;
+        for (const auto& [first, second] : {Word{0, current + 1}, Word{0, 0}, Word{1, current}}) {
             std::string why;
-            EXPECT_FALSE(readStored(bytes, &why)) << kind;
+            EXPECT_FALSE(readStored(withVersion(bytes, first, second, 4), &why)) << kind;
             EXPECT_NE(why.find("version ("), std::string::npos) << why;
         }
     }
 }
 
 TEST_F(MaterialRecordsTest, WritersRefuseMissingRequiredMembers) {
-    auto layeredWithHole = make<MaterialLayeredBRDF>("L");
-    layeredWithHole->layers = {createBRDF(Base_BRDF::kDiffuse), BRDFPtr()};
-    auto multiWithHole = make<MaterialMulti>("M");
-    multiWithHole->subMaterials = {make<MaterialLayeredBRDF>("a"), MaterialPtr()};
-    const MaterialPtr refused[] = {make<MaterialBump>("B"), make<MaterialSingleBRDF>("S"), make<MaterialLinked>("K"),
-                                   layeredWithHole, multiWithHole};
+    const MaterialPtr refused[] = {
+        make<MaterialBump>("B"), make<MaterialSingleBRDF>("S"), make<MaterialLinked>("K"),
+        make<MaterialLayeredBRDF>("L", [](auto& m) { m.layers = {createBRDF(Base_BRDF::kDiffuse), BRDFPtr()}; }),
+        make<MaterialMulti>("M", [](auto& m) { m.subMaterials = {make<MaterialLayeredBRDF>("a"), MaterialPtr()}; })};
     for (const MaterialPtr& m : refused) {
         QuickArchive ar;
         EXPECT_FALSE(m->writeToArchive(ar)) << m->name;
@@ -344,32 +304,25 @@ TEST_F(MaterialRecordsTest, WritersRefuseMissingRequiredMembers) {
 }
 
 TEST_F(MaterialRecordsTest, ResetsAndReadingOver) {
-    using texturetest::readInto;
     // Kinds that reset first lose what the record does not hold ...
-    auto displaced = make<MaterialDisplaced>("D");
-    displaced->displaceShift = 9.0f;
+    auto displaced = make<MaterialDisplaced>("D", [](auto& m) { m.displaceShift = 9.0f; });
     ASSERT_TRUE(readInto(*displaced,
                          Image().version(0, 1).append(baseRecord("D2", "")).flag(false).flag(false).f32({1}).bytes));
     EXPECT_TRUE(displaced->displaceShift == 0.0f && displaced->name == "D2");
     // ... the others read over their fields, and the multi appends.
-    auto twoSided = make<Material2Sided>("T");
-    twoSided->transparency = Color{1, 1, 1};
-    const ByteVector twoSidedV1 =
-        Image().version(0, 1).flag(false).flag(false).flag(false).f32({0, 0, 0, 1}).flag(false).bytes;
-    ASSERT_TRUE(readInto(*twoSided, twoSidedV1));
+    auto twoSided = make<Material2Sided>("T", [](auto& m) { m.transparency = Color{1, 1, 1}; });
+    ASSERT_TRUE(readInto(*twoSided, Image().version(0, 1).flag(false).flag(false).flag(false).f32({0, 0, 0, 1})
+                                        .flag(false).bytes));
     EXPECT_EQ(twoSided->transparency, (Color{1, 1, 1}));
-    auto multi = make<MaterialMulti>("M");
-    multi->subMaterials.push_back(make<MaterialLayeredBRDF>("a"));
-    ASSERT_TRUE(readInto(*multi, texturetest::recordOf(*multi)));
+    auto multi = make<MaterialMulti>("M", [](auto& m) { m.subMaterials = {make<MaterialLayeredBRDF>("a")}; });
+    ASSERT_TRUE(readInto(*multi, recordOf(*multi)));
     EXPECT_EQ(multi->subMaterials.size(), 2u);
 
     // The bump's reset takes a new default name; the toon's keeps the name.
-    auto bump = make<MaterialBump>("X");
-    bump->identifier = "id";
+    auto bump = make<MaterialBump>("X", [](auto& m) { m.identifier = "id"; });
     bump->resetToDefaults();
     EXPECT_EQ(bump->name + bump->identifier, "DefaultMaterial");
-    auto toon = make<MaterialToon>("Keep");
-    toon->lineWidth = 7.0f;
+    auto toon = make<MaterialToon>("Keep", [](auto& m) { m.lineWidth = 7.0f; });
     toon->resetToDefaults();
     EXPECT_TRUE(toon->name == "Keep" && toon->lineWidth == 1.5f);
 
@@ -384,49 +337,46 @@ TEST_F(MaterialRecordsTest, ResetsAndReadingOver) {
 
 TEST_F(MaterialRecordsTest, Copies) {
     ASSERT_TRUE(library().add(make<MaterialLayeredBRDF>("Base")));
-    auto layered = make<MaterialLayeredBRDF>("Base");
-    layered->identifier = "id";
-    layered->layers.push_back(createBRDF(Base_BRDF::kDiffuse));
+    auto layered = make<MaterialLayeredBRDF>("Base", [](auto& m) {
+        m.identifier = "id", m.layers = {createBRDF(Base_BRDF::kDiffuse)};
+    });
     const auto copy = as<MaterialLayeredBRDF>(layered->clone());
     EXPECT_TRUE(copy->name == "Base" && copy->identifier.empty() && copy->layers[0] != layered->layers[0]);
     EXPECT_EQ(layered->cloneRenamed()->name, "Base1"); // the source's name is taken
 
     // Shared on copying: the single's BRDF, the multi's entries, the two-sided's textures.
-    auto single = make<MaterialSingleBRDF>("S");
-    single->brdf = createBRDF(Base_BRDF::kGlass);
+    auto single = make<MaterialSingleBRDF>("S", [](auto& m) { m.brdf = createBRDF(Base_BRDF::kGlass); });
     EXPECT_EQ(as<MaterialSingleBRDF>(single->clone())->brdf, single->brdf);
-    auto multi = make<MaterialMulti>("M");
-    multi->subMaterials.push_back(layered);
+    auto multi = make<MaterialMulti>("M", [&](auto& m) { m.subMaterials = {layered}; });
     EXPECT_EQ(as<MaterialMulti>(multi->cloneRenamed())->subMaterials[0], layered);
-    auto twoSided = make<Material2Sided>("T");
-    twoSided->front = layered;
-    twoSided->translucencyTex = boost::make_shared<AColorTexture>();
+    auto twoSided = make<Material2Sided>("T", [&](auto& m) {
+        m.front = layered, m.translucencyTex = boost::make_shared<AColorTexture>();
+    });
     const auto twoCopy = as<Material2Sided>(twoSided->clone());
     EXPECT_TRUE(twoCopy->front != layered && twoCopy->front->name == "Base");
     EXPECT_EQ(twoCopy->translucencyTex, twoSided->translucencyTex);
 
     // Even the toon's clone() renames its base material.
-    auto toon = make<MaterialToon>("Toon");
-    toon->baseMtl = layered;
-    toon->opacityTex = boost::make_shared<AColorTexture>();
+    auto toon = make<MaterialToon>("Toon", [&](auto& m) {
+        m.baseMtl = layered, m.opacityTex = boost::make_shared<AColorTexture>();
+    });
     const auto toonCopy = as<MaterialToon>(toon->clone());
     EXPECT_TRUE(toonCopy->name == "Toon" && toonCopy->baseMtl->name == "Base1");
     EXPECT_NE(toonCopy->opacityTex, toon->opacityTex);
 
     // The wrappers' textures are copied with them.
-    auto bump = make<MaterialBump>("Bump");
-    bump->baseMtl = layered;
-    bump->bumpTex = boost::make_shared<AColorTexture>();
-    auto alpha = make<MaterialAlphaContribution>("Alpha");
-    alpha->alphaTex = boost::make_shared<AColorTexture>();
+    auto bump = make<MaterialBump>("Bump", [&](auto& m) {
+        m.baseMtl = layered, m.bumpTex = boost::make_shared<AColorTexture>();
+    });
+    auto alpha =
+        make<MaterialAlphaContribution>("Alpha", [](auto& m) { m.alphaTex = boost::make_shared<AColorTexture>(); });
     const auto bumpCopy = as<MaterialBump>(bump->cloneRenamed());
     const auto alphaCopy = as<MaterialAlphaContribution>(alpha->clone());
     EXPECT_TRUE(bumpCopy->bumpTex && bumpCopy->bumpTex != bump->bumpTex && bumpCopy->baseMtl->name == "Base1");
     EXPECT_TRUE(alphaCopy->alphaTex && alphaCopy->alphaTex != alpha->alphaTex && !alphaCopy->baseMtl);
     EXPECT_TRUE(bumpCopy->isEqual(bump) && alphaCopy->isEqual(alpha));
 
-    auto reference = make<MaterialReference>("Base");
-    reference->heldMaterial = layered;
+    auto reference = make<MaterialReference>("Base", [&](auto& m) { m.heldMaterial = layered; });
     const auto refCopy = as<MaterialReference>(reference->cloneRenamed());
     EXPECT_TRUE(refCopy->name == "Base" && refCopy->heldMaterial == layered);
 }
@@ -435,23 +385,23 @@ TEST_F(MaterialRecordsTest, Comparison) {
     auto instance = make<MaterialInstance>("I");
     EXPECT_FALSE(instance->isEqual(instance));
 
-    auto a = make<MaterialLinked>("A"), b = make<MaterialLinked>("B");
-    a->linkedMaterial = make<MaterialLayeredBRDF>("x");
-    b->linkedMaterial = make<MaterialLayeredBRDF>("y"); // names are not compared
-    a->idData.setText("C:/Lib/Wood");
-    b->idData.setText("c:/lib/WOOD");
+    // Names are not compared.
+    auto a = make<MaterialLinked>("A", [](auto& m) {
+        m.linkedMaterial = make<MaterialLayeredBRDF>("x"), m.idData.setText("C:/Lib/Wood");
+    });
+    auto b = make<MaterialLinked>("B", [](auto& m) {
+        m.linkedMaterial = make<MaterialLayeredBRDF>("y"), m.idData.setText("c:/lib/WOOD");
+    });
     EXPECT_TRUE(a->isEqual(b));
     b->idData.setText("c:/lib/WOOD", 0);
     EXPECT_FALSE(a->isEqual(b)); // another tag
     EXPECT_FALSE(a->isEqual(make<MaterialBump>("A")));
 
     // References compare their targets ignoring case, then what the library finds.
-    auto target = make<MaterialLayeredBRDF>("Target");
-    target->identifier = "ID-T";
+    auto target = make<MaterialLayeredBRDF>("Target", [](auto& m) { m.identifier = "ID-T"; });
     ASSERT_TRUE(library().add(target));
-    auto r1 = make<MaterialReference>("r1"), r2 = make<MaterialReference>("r2");
-    r1->targetId = "id-t";
-    r2->targetId = "ID-T";
+    auto r1 = make<MaterialReference>("r1", [](auto& m) { m.targetId = "id-t"; });
+    auto r2 = make<MaterialReference>("r2", [](auto& m) { m.targetId = "ID-T"; });
     EXPECT_FALSE(r1->isEqual(r2)); // only "ID-T" is in the library
     r1->targetId = "ID-T";
     EXPECT_TRUE(r1->isEqual(r2));
@@ -460,13 +410,10 @@ TEST_F(MaterialRecordsTest, Comparison) {
 }
 
 TEST_F(MaterialRecordsTest, ReferencesHoldWhatTheLibraryHas) {
-    auto target = make<MaterialLayeredBRDF>("Target");
-    target->identifier = "id-t";
+    auto target = make<MaterialLayeredBRDF>("Target", [](auto& m) { m.identifier = "id-t"; });
     ASSERT_TRUE(library().add(target));
-    auto reference = make<MaterialReference>("R");
-    reference->targetId = "id-missing";
-    reference->heldMaterial = target;
-    EXPECT_EQ(texturetest::recordOf(*reference),
+    auto reference = make<MaterialReference>("R", [&](auto& m) { m.targetId = "id-missing", m.heldMaterial = target; });
+    EXPECT_EQ(recordOf(*reference),
               Image().version(0, 2).append(baseRecord("R", "")).text("id-missing").flag(false).bytes);
     EXPECT_FALSE(reference->heldMaterial);
 

@@ -1,20 +1,15 @@
 #pragma once
 // Helpers shared by the material tests: a clean scene library around every test,
-// named materials of any kind, and the byte images of TextureTestSupport.
-#include "TextureTestSupport.hpp"
+// named materials of any kind, and the shared record helpers.
+#include "TrimSupport.hpp"
 
 #include <dexmor/materials/Materials.hpp>
-
-#include <boost/make_shared.hpp>
-#include <gtest/gtest.h>
-
-#include <string>
 
 namespace materialtest {
 
 using namespace OrvexKavorCore;
-using texturetest::ByteVector;
-using texturetest::Image;
+using testsupport::ByteVector;
+using testsupport::Image;
 
 // The library is process-wide: every test starts and ends with it empty.
 class LibraryTest : public ::testing::Test {
@@ -24,11 +19,17 @@ protected:
     SceneMaterials& library() { return *SceneMaterials::instance(); }
 };
 
-template <class Kind>
-boost::shared_ptr<Kind> make(const std::string& name) {
+// A material of `Kind` named `name`, with `set` applied to it.
+template <class Kind, class Set>
+boost::shared_ptr<Kind> make(const std::string& name, Set set) {
     auto m = boost::make_shared<Kind>();
     m->name = name;
+    set(*m);
     return m;
+}
+template <class Kind>
+boost::shared_ptr<Kind> make(const std::string& name) {
+    return make<Kind>(name, [](Kind&) {});
 }
 
 // The record of a material as stored in a file: kind id, then the record.
@@ -45,7 +46,7 @@ inline MaterialPtr readStored(const ByteVector& bytes, std::string* why = nullpt
     QuickArchive ar(bytes.data(), bytes.size());
     MaterialPtr m;
     const bool ok = readMember(ar, m);
-    if (why) *why = texturetest::failureOf(ar);
+    if (why) *why = testsupport::failureOf(ar);
     if (!ok) return {};
     EXPECT_EQ(ar.readPosition(), bytes.size());
     return m;

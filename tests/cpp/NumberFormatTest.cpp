@@ -17,18 +17,12 @@ using namespace OrvexKavorCore;
 
 TEST(NumberFormat, Floats) {
     using limits = std::numeric_limits<float>;
+    // (Finite values, halfway cases among them: the comparison with the C library below.)
     const std::vector<std::pair<float, const char*>> cases = {
-        {0.0f, "0"}, {-0.0f, "-0"}, {0.1f, "0.1"}, {0.5f, "0.5"}, {1.0f, "1"}, {-2.5f, "-2.5"},
-        {1.0f / 3.0f, "0.333333"}, {2.0f / 3.0f, "0.666667"}, {100000.0f, "100000"}, {999999.0f, "999999"},
-        {1e6f, "1e+006"}, {1234567.0f, "1.23457e+006"}, {0.0001f, "0.0001"}, {1e-5f, "1e-005"},
-        {2.5e-7f, "2.5e-007"}, {-3.75e-12f, "-3.75e-012"}, {1e20f, "1e+020"},
-        {limits::max(), "3.40282e+038"}, {-limits::max(), "-3.40282e+038"}, {limits::min(), "1.17549e-038"},
-        // Subnormals: six digits of their exact value.
-        {limits::denorm_min(), "1.4013e-045"}, {std::bit_cast<float>(0x007FFFFFu), "1.17549e-038"},
-        {1e-40f, "9.99995e-041"},
+        {0.0f, "0"}, {-0.0f, "-0"}, {1e6f, "1e+006"}, {2.5e-7f, "2.5e-007"}, {limits::max(), "3.40282e+038"},
+        {limits::denorm_min(), "1.4013e-045"}, // six digits of a subnormal's exact value
         // Exactly halfway between two six-digit results: away from zero.
-        {0.0009765625f, "0.000976563"}, {1234.125f, "1234.13"}, {123456.5f, "123457"}, {-123456.5f, "-123457"},
-        {1.015625f, "1.01563"}, {12345650.0f, "1.23457e+007"}, {999999.5f, "1e+006"},
+        {1234.125f, "1234.13"}, {-123456.5f, "-123457"}, {999999.5f, "1e+006"},
         // Not halfway, although the shortest text of the float ends in a 5.
         {1.000005f, "1.00001"}, {1.000045f, "1.00004"},
         {limits::infinity(), "inf"}, {-limits::infinity(), "-inf"}, {limits::quiet_NaN(), "nan"},

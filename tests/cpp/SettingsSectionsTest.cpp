@@ -1,16 +1,9 @@
 // The XML document of an options set: the twenty-one settings sections as golden
 // documents, and what single parameters show for chosen values.
-#include "TestSupport.hpp"
+#include "TrimSupport.hpp"
 
-#include <dexmor/files/ConversionContext.hpp>
 #include <dexmor/options/AllOptions.hpp>
 #include <dexmor/textures/SkyTexture.hpp>
-
-#include <gtest/gtest.h>
-
-#include <functional>
-#include <string>
-#include <tuple>
 
 using namespace OrvexKavorCore;
 using namespace testsupport;
@@ -46,7 +39,6 @@ std::string parameterOf(const std::string& xml, const std::string& url, const st
 } // namespace
 
 TEST(Settings, DefaultDocumentGolden) {
-    const ConversionContext fresh1;
     AllOptions options;
     const std::string xml = documentOf(options);
     expectGolden(xml, "options_default.xml");
@@ -54,7 +46,6 @@ TEST(Settings, DefaultDocumentGolden) {
 }
 
 TEST(Settings, EnvironmentTexturesGolden) {
-    const ConversionContext fresh2;
     AllOptions options;
     options.bg_tex = createTexture(BaseTexture::kChecker), options.gi_tex = createTexture(BaseTexture::kSky);
     options.reflect_tex = createTexture(BaseTexture::kSky), options.refract_tex = createTexture(BaseTexture::kFresnel);
@@ -71,47 +62,37 @@ TEST(Settings, EnvironmentTexturesGolden) {
         EXPECT_LT(xml.find(std::string("url=\"/SettingsEnvironment/") + child + "\""), environment) << child;
 }
 
+// The parameters of chosen values, one a line, in settings_chosen_parameters.xml.
 TEST(Settings, WhatParametersShow) {
-    // One parameter's lines without indentation, as `parameterOf` joins them.
-    const auto shown = [](const char* type, const char* name, const std::string& value, const char* extra = "") {
-        return std::string("<parameter type=\"") + type + "\" name=\"" + name + "\" listType=\"none\"" + extra +
-               " label=\"" + name + "\"><value>" + value + "</value></parameter>";
-    };
-    const std::string clapper = "\xF0\x9F\x8E\xAC";
-    const std::tuple<std::function<void(AllOptions&)>, const char*, const char*, std::string> cases[] = {
-        // The filter kinds 1 and 2 are exchanged.
-        {[](AllOptions& o) { o.filter_kind = 1; }, "/SettingsImageFilter", "type", shown("integer", "type", "2")},
-        {[](AllOptions& o) { o.filter_kind = 2; }, "/SettingsImageFilter", "type", shown("integer", "type", "1")},
-        // The multiplier follows whether the texture is set.
-        {[](AllOptions& o) { o.bg_mult = 3, o.bg_tex_mult = 7; }, "/SettingsEnvironment", "bg_mult",
-         shown("float", "bg_mult", "3")},
+    const std::tuple<std::function<void(AllOptions&)>, const char*, const char*> cases[] = {
+        // The filter kinds 1 and 2 are exchanged: 2, then 1.
+        {[](AllOptions& o) { o.filter_kind = 1; }, "/SettingsImageFilter", "type"},
+        {[](AllOptions& o) { o.filter_kind = 2; }, "/SettingsImageFilter", "type"},
+        // The multiplier follows whether the texture is set: 3, then 7.
+        {[](AllOptions& o) { o.bg_mult = 3, o.bg_tex_mult = 7; }, "/SettingsEnvironment", "bg_mult"},
         {[](AllOptions& o) { o.bg_mult = 3, o.bg_tex_mult = 7, o.bg_tex = createTexture(BaseTexture::kChecker); },
-         "/SettingsEnvironment", "bg_mult", shown("float", "bg_mult", "7")},
-        // The depth-of-field switch shows the stored inverse.
-        {[](AllOptions& o) { o.inverse_override_focal_dist = 0; }, "/SettingsCameraDof", "override_focal_dist",
-         shown("bool", "override_focal_dist", "1", " isUserData=\"1\"")},
-        // Unsigned fields show as signed 32-bit integers.
-        {[](AllOptions& o) { o.params.gi.primary_engine = 0xFFFFFFFFu; }, "/SettingsGI", "primary_engine",
-         shown("integer", "primary_engine", "-1")},
+         "/SettingsEnvironment", "bg_mult"},
+        // The depth-of-field switch shows the stored inverse: 1, as user data.
+        {[](AllOptions& o) { o.inverse_override_focal_dist = 0; }, "/SettingsCameraDof", "override_focal_dist"},
+        // Unsigned fields show as signed 32-bit integers: -1.
+        {[](AllOptions& o) { o.params.gi.primary_engine = 0xFFFFFFFFu; }, "/SettingsGI", "primary_engine"},
         // Channels by name; an id without a name gives an empty entry.
-        {[](AllOptions& o) { o.channels = {126, 99, 133, 123, 125}; }, "/SettingsRenderChannels", "channel_names",
-         "<parameter type=\"list\" name=\"channel_names\" listType=\"string\" label=\"VFB Channels\"><value><list>"
-         "<entry>RGB color</entry><entry></entry><entry>SSS2</entry><entry>Normals</entry><entry>Alpha</entry>"
-         "</list></value></parameter>"},
-        // File names: at most 2047 UTF-16 units.
-        {[clapper](AllOptions& o) { o.img_file = std::string(2046, 'x') + clapper; }, "/SettingsOutput", "img_file",
-         shown("string", "img_file", std::string(2046, 'x'))},
-        // Animated camera values show their value at time 0.
+        {[](AllOptions& o) { o.channels = {126, 99, 133, 123, 125}; }, "/SettingsRenderChannels", "channel_names"},
+        // File names: at most 2047 UTF-16 units (the last character would straddle the end).
+        {[](AllOptions& o) { o.img_file = std::string(2046, 'x') + "\xF0\x9F\x8E\xAC"; }, "/SettingsOutput",
+         "img_file"},
+        // Animated camera values show their value at time 0: 50.
         {[](AllOptions& o) { o.camera.focal_length.setValue(85.0f, 10.0), o.camera.focal_length.setValue(50.0f, 0.0); },
-         "/CameraPhysical", "focal_length", shown("float", "focal_length", "50")},
+         "/CameraPhysical", "focal_length"},
     };
-    for (const auto& [set, url, name, expected] : cases) {
+    std::string shown;
+    for (const auto& [set, url, name] : cases) {
         AllOptions options;
         set(options);
-        EXPECT_EQ(parameterOf(documentOf(options), url, name), expected);
+        shown += parameterOf(documentOf(options), url, name) + "\n";
     }
-
     // Section urls begin with the prefix the caller gives.
     AllOptions options;
-    EXPECT_EQ(parameterOf(documentOf(options, "/opts"), "/opts/CameraPhysical", "on"), shown("bool", "on", "0"));
+    shown += parameterOf(documentOf(options, "/opts"), "/opts/CameraPhysical", "on") + "\n";
+    expectGolden(shown, "settings_chosen_parameters.xml");
 }
