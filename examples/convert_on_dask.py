@@ -4,21 +4,29 @@ on a Dask cluster, through the Python module Dexmor.
 
     convert_on_dask.py -o OUT FOLDER_OR_FILE...                          # a local cluster
     convert_on_dask.py -o OUT --scheduler tcp://HOST:8786 FOLDER_OR_FILE...
+    convert_on_dask.py -o OUT --scheduler tcp://HOST:8786 --send-bytes FOLDER_OR_FILE...
 
 Each argument is a file, or a folder whose .zelmat and .zelopt files (directly in
 it, any letter case) are all converted. Every file gives OUT/<file name>.xml, the
 same text that `dexmor xml -o OUT` writes and that Dexmor.getZelmatXml /
 getZeloptXml return. OUT/text-fallbacks.tsv lists the files that did not read as
-binary and were passed through as text (or as the empty text), each with the
-reason that Dexmor.diagnose gives where the module has it.
+binary and were passed through as text, each with the reason that
+Dexmor.diagnose gives. A file that cannot be opened, or whose document would
+exceed the output budget, gets no output and is reported.
+
+Every file is read once: Dexmor.convertWithDiagnosis gives its text and the
+reason it did not read as binary (or None) from one reading.
 
 Without --scheduler the script starts a cluster of worker processes on this
 machine (--workers, default: the number of processors). With it, it connects to
-a running cluster. The workers read the inputs and write the outputs
+a running cluster. The workers need the module Dexmor installed; this machine
+does not. By default the workers read the inputs and write the outputs
 themselves, so every path must name the same file on every worker (a shared
-file system), and the workers need the module Dexmor installed; this machine
-does not. Each worker runs one conversion at a time per thread; the module
-releases the interpreter lock, so --threads above 1 also runs in parallel.
+file system). With --send-bytes this machine reads each file and sends its bytes
+to a worker, which converts them with Dexmor.convertBytesWithDiagnosis and sends
+the document back to be written here: the workers need no access to the files.
+Each worker runs one conversion at a time per thread; the module releases the
+interpreter lock, so --threads above 1 also runs in parallel.
 
 Exit status: 0 when every output was written (files passed through as text
 count as written), 1 when some were not, 2 for wrong usage.
@@ -36,34 +44,6 @@ EXTENSIONS = (".zelmat", ".zelopt")
 SUMMARY_NAME = "text-fallbacks.tsv"
 
 # ---- on the workers --------------------------------------------------------------
-
-# Windows-1252 where it differs from Latin-1 (0x80 to 0x9F); its five undefined
-# bytes stay the code points of the same number, as the conversion maps them.
-_CP1252_HIGH = {b: bytes([b]).decode("cp1252") for b in range(0x80, 0xA0) if b not in (0x81, 0x8D, 0x8F, 0x90, 0x9D)}
-
-
-def own_text(path):
-    """The text the conversion returns for a file that does not read as binary:
-    its bytes up to the first NUL, as UTF-8, or as Windows-1252 when they are not
-    UTF-8; "" when the file cannot be read."""
-    data = bytearray()
-    try:
-        with open(path, "rb") as file:
-            while True:  # a binary file has its first NUL within a few bytes
-                block = file.read(1 << 20)
-                nul = block.find(0)
-                if nul >= 0:
-                    data += block[:nul]
-                    break
-                if not block:
-                    break
-                data += block
-    except OSError:
-        return ""
-    try:
-        return data.decode("utf-8")
-    except UnicodeDecodeError:
-        return data.decode("latin-1").translate(_CP1252_HIGH)
 
 
 def current_umask():
@@ -104,33 +84,57 @@ def write_atomically(target, data):
         raise
 
 
-def convert_one(source, target):
-    """Converts one file; returns (source, outcome, detail, bytes written), where
-    outcome is "xml", "text" (passed through; detail is the reason) or "failed"."""
+def failure_text(failure):
+    return f"{type(failure).__name__}: {failure}"
+
+
+def converted(source, data=None):
+    """Converts one file: the file at `source`, read here once, or `data`, its bytes
+    read elsewhere. Returns (outcome, detail, document): outcome "xml", or "text"
+    when the file did not read as binary and passed through as its own text (detail
+    is the reason), with the document's UTF-8 bytes; or "failed" (detail says why:
+    the file cannot be opened, the document is over its budget) and None."""
     import Dexmor
 
-    convert = Dexmor.getZelmatXml if source.lower().endswith(".zelmat") else Dexmor.getZeloptXml
+    kind = "zelmat" if source.lower().endswith(".zelmat") else "zelopt"
     try:
-        xml = convert(source)
+        if data is None:
+            xml, reason = Dexmor.convertWithDiagnosis(source, kind=kind)
+        else:
+            xml, reason = Dexmor.convertBytesWithDiagnosis(data, kind)
     except (Dexmor.error, OSError, ValueError, TypeError, MemoryError) as failure:
-        return source, "failed", f"{type(failure).__name__}: {failure}", 0
-    data = xml.encode("utf-8")
+        return "failed", failure_text(failure), None
+    return ("xml" if reason is None else "text"), reason, xml.encode("utf-8")
+
+
+def store(source, target, outcome, detail, document):
+    """Writes a converted document to its target; returns (source, outcome, detail,
+    bytes written)."""
+    if outcome == "failed":
+        return source, outcome, detail, 0
     try:
-        write_atomically(target, data)
+        write_atomically(target, document)
     except OSError as failure:
         return source, "failed", f"cannot write {target}: {failure.strerror or failure}", 0
-    # A document made from binary records never equals the file's own text: the
-    # records of both kinds begin with a NUL byte within their first two bytes.
-    if xml != own_text(source):
-        return source, "xml", None, len(data)
-    diagnose = getattr(Dexmor, "diagnose", None)
-    reason = diagnose(source) if diagnose is not None else None
-    return source, "text", reason or "not readable as binary", len(data)
+    return source, outcome, detail, len(document)
+
+
+def convert_one(source, target):
+    """Converts one file and writes its document; returns (source, outcome, detail,
+    bytes written), where outcome is "xml", "text" (passed through; detail is the
+    reason) or "failed"."""
+    return store(source, target, *converted(source))
 
 
 def convert_batch(jobs):
     """A task: converts each (source, target) pair of the batch."""
     return [convert_one(source, target) for source, target in jobs]
+
+
+def convert_sent_batch(files):
+    """A task: converts each (source, bytes) pair of the batch; returns (source,
+    outcome, detail, document) for the client to write."""
+    return [(source, *converted(source, data)) for source, data in files]
 
 
 # ---- on the client ---------------------------------------------------------------
@@ -179,22 +183,61 @@ def connect(args):
     return Client(cluster), cluster
 
 
+def read_files(jobs):
+    """The bytes of each job's file, read here once, as (source, bytes) pairs; and
+    the results of the files that cannot be read."""
+    files, failed = [], []
+    for source, _ in jobs:
+        try:
+            with open(source, "rb") as file:
+                files.append((source, file.read()))
+        except OSError as failure:
+            failed.append((source, "failed", failure_text(failure), 0))
+    return files, failed
+
+
 def run(jobs, args):
     """Converts every job on the cluster; one result per job, in any order."""
     from distributed import as_completed
 
     client, cluster = connect(args)
     try:
-        batches = [jobs[i: i + args.batch_size] for i in range(0, len(jobs), args.batch_size)]
-        futures = {client.submit(convert_batch, batch, pure=False): batch for batch in batches}
-        results = []
-        for future in as_completed(futures):
-            if future.status == "finished":
+        targets = dict(jobs)
+        batches = iter([jobs[i: i + args.batch_size] for i in range(0, len(jobs), args.batch_size)])
+        # A batch of paths is small: all of them go at once. A batch of bytes holds
+        # its files, and then their documents, in this process's memory: only a
+        # couple for each thread of the cluster are under way at a time.
+        in_flight = max(2 * sum(client.nthreads().values()), 2) if args.send_bytes else len(targets)
+        results, futures, running = [], {}, as_completed()
+
+        def submit_next():
+            for batch in batches:
+                if args.send_bytes:
+                    files, unread = read_files(batch)
+                    results.extend(unread)
+                    if not files:
+                        continue
+                    future = client.submit(convert_sent_batch, files, pure=False)
+                    futures[future] = [source for source, _ in files]
+                else:
+                    future = client.submit(convert_batch, batch, pure=False)
+                    futures[future] = [source for source, _ in batch]
+                running.add(future)
+                return
+
+        for _ in range(in_flight):
+            submit_next()
+        for future in running:
+            sources = futures.pop(future)
+            if future.status != "finished":  # the task itself failed: a worker died, or the module is missing there
+                failure = failure_text(future.exception())
+                results.extend((source, "failed", failure, 0) for source in sources)
+            elif args.send_bytes:
+                results.extend(store(source, targets[source], *outcome) for source, *outcome in future.result())
+            else:
                 results.extend(future.result())
-            else:  # the task itself failed: a worker died, or the module is missing there
-                failure = future.exception()
-                results.extend((source, "failed", f"{type(failure).__name__}: {failure}", 0)
-                               for source, _ in futures[future])
+            del future  # with its result: a batch of documents is let go of before the next one comes
+            submit_next()
         return results, len(client.scheduler_info()["workers"])
     finally:
         client.close()
@@ -226,6 +269,9 @@ def parse_arguments(argv):
                         help="threads per worker process of the local cluster (default: %(default)s)")
     parser.add_argument("--batch-size", type=int, default=8, metavar="N",
                         help="files converted by one task (default: %(default)s)")
+    parser.add_argument("--send-bytes", action="store_true",
+                        help="read the files here and send their bytes to the workers, which send back the "
+                             "documents to be written here: no shared file system is needed")
     parser.add_argument("--summary", metavar="FILE",
                         help=f"the list of files passed through as text (default: DIR/{SUMMARY_NAME})")
     args = parser.parse_args(argv)

@@ -3,8 +3,19 @@
 //   Dexmor.getZelmatXml(path) -> str   XML of a material library (".zelmat")
 //   Dexmor.getZeloptXml(path) -> str   XML of a render-options file (".zelopt")
 //   Dexmor.diagnose(path) -> str|None  why a file does not read as binary, or None
-//   Dexmor.error                      raised when a path has the wrong extension
-//                                     or the conversion fails unexpectedly
+//   Dexmor.convert(path, *, kind, strict, max_output) -> str
+//   Dexmor.convertWithDiagnosis(path, *, kind, max_output) -> (str, str|None)
+//   Dexmor.convertBytes(data, kind, *, strict, max_output) -> str
+//   Dexmor.convertBytesWithDiagnosis(data, kind, *, max_output) -> (str, str|None)
+//   Dexmor.diagnoseBytes(data, kind) -> str|None
+//   Dexmor.error                      raised when a path has the wrong extension,
+//                                     a document exceeds its budget, or the
+//                                     conversion fails unexpectedly
+//   Dexmor.ReadError(error)           raised by strict conversions of a file that
+//                                     does not read as binary
+//
+// The two getters pass a file that cannot be opened through as "", as they
+// always have; the newer calls raise the OSError that open() would.
 //
 // The module only handles arguments and results; the conversion and the
 // diagnosis are the core's, and run with the interpreter lock released.
@@ -16,6 +27,7 @@
 #include <dexmor/version.hpp>
 #include <dexmor/platform/Text.hpp>
 
+#include <cerrno>
 #include <chrono>
 #include <cstring>
 #include <exception>
@@ -26,6 +38,7 @@
 #include <string_view>
 #include <thread>
 #include <utility>
+#include <vector>
 
 #include <sys/syscall.h>
 #include <unistd.h>
@@ -35,21 +48,41 @@ namespace {
 namespace core = OrvexKavorCore;
 namespace python = dexmor::python;
 
-// Dexmor.error. The module attribute holds one reference, this static another.
+// Dexmor.error and Dexmor.ReadError. The module attributes hold one reference
+// each, these statics another.
 PyObject* moduleError = nullptr;
+PyObject* readError = nullptr;
 
 // An owned reference, released when it goes out of scope.
 class Ref {
 public:
     explicit Ref(PyObject* object) : object_(object) {}
+    Ref(Ref&& other) noexcept : object_(std::exchange(other.object_, nullptr)) {}
     ~Ref() { Py_XDECREF(object_); }
     Ref(const Ref&) = delete;
     Ref& operator=(const Ref&) = delete;
+    Ref& operator=(Ref&&) = delete;
     PyObject* get() const { return object_; }
+    PyObject* release() { return std::exchange(object_, nullptr); }
     explicit operator bool() const { return object_ != nullptr; }
 
 private:
     PyObject* object_;
+};
+
+// A buffer argument ("y*"), released when it goes out of scope.
+struct HeldBuffer {
+    Py_buffer view{};
+    HeldBuffer() = default;
+    HeldBuffer(const HeldBuffer&) = delete;
+    HeldBuffer& operator=(const HeldBuffer&) = delete;
+    ~HeldBuffer() {
+        if (view.obj) PyBuffer_Release(&view);
+    }
+    core::Input input() const {
+        const auto* bytes = static_cast<const char*>(view.buf);
+        return core::Input::ofBytes(std::string_view(bytes, static_cast<std::size_t>(view.len)));
+    }
 };
 
 struct Call {
@@ -62,9 +95,14 @@ constexpr Call zelmatCall{core::FileKind::MaterialLibrary, "getZelmatXml", "O:ge
 constexpr Call zeloptCall{core::FileKind::RenderOptions, "getZeloptXml", "O:getZeloptXml"};
 constexpr Call diagnoseCall{std::nullopt, "diagnose", "O:diagnose"};
 
+// A str of text that may not be valid UTF-8 (a reason may quote what it read).
+PyObject* lenientText(std::string_view text) {
+    return PyUnicode_DecodeUTF8(text.data(), static_cast<Py_ssize_t>(text.size()), "replace");
+}
+
 // Raises Dexmor.error with a message that may not be valid UTF-8.
 void raiseModuleError(const char* message) noexcept {
-    PyObject* text = PyUnicode_DecodeUTF8(message, static_cast<Py_ssize_t>(std::strlen(message)), "replace");
+    PyObject* text = lenientText(message);
     if (!text) return; // the decoder has set its own exception
     PyErr_SetObject(moduleError, text);
     Py_DECREF(text);
@@ -90,10 +128,12 @@ void raiseFromCxx(std::exception_ptr failure) noexcept {
     }
 }
 
+// ---- arguments -----------------------------------------------------------------
+
 // The path argument as a str: the str itself, or what an os.PathLike's
 // __fspath__ returns. Bytes paths are not accepted. New reference, or nullptr
 // with an exception set.
-PyObject* pathAsText(PyObject* argument, const Call& call) {
+PyObject* pathAsText(PyObject* argument, const char* function) {
     if (PyUnicode_Check(argument)) {
         Py_INCREF(argument);
         return argument;
@@ -103,27 +143,25 @@ PyObject* pathAsText(PyObject* argument, const Call& call) {
         PyObject* path = PyOS_FSPath(argument);
         if (!path || PyUnicode_Check(path)) return path;
         PyErr_Format(PyExc_TypeError, "%s() argument must be str or os.PathLike returning str, not %.200s returning %.200s",
-                     call.name, Py_TYPE(argument)->tp_name, Py_TYPE(path)->tp_name);
+                     function, Py_TYPE(argument)->tp_name, Py_TYPE(path)->tp_name);
         Py_DECREF(path);
         return nullptr;
     }
-    PyErr_Format(PyExc_TypeError, "%s() argument must be str or os.PathLike, not %.200s", call.name,
+    PyErr_Format(PyExc_TypeError, "%s() argument must be str or os.PathLike, not %.200s", function,
                  Py_TYPE(argument)->tp_name);
     return nullptr;
 }
 
-// A file argument: its path as the system sees it, and the kind it names.
-struct FileArgument {
+// A path argument: the str the caller gave (or its __fspath__), and the path as
+// the system sees it.
+struct PathArgument {
+    Ref text;
     std::string path;
-    core::FileKind kind;
 };
 
-// Parses the one path argument of a call and checks its extension; nullopt with
-// an exception set when it is not acceptable.
-std::optional<FileArgument> fileArgument(PyObject* args, const Call& call) {
-    PyObject* argument = nullptr;
-    if (!PyArg_ParseTuple(args, call.format, &argument)) return std::nullopt;
-    const Ref text(pathAsText(argument, call));
+// nullopt with an exception set when the argument is no acceptable path.
+std::optional<PathArgument> pathArgument(PyObject* argument, const char* function) {
+    Ref text(pathAsText(argument, function));
     if (!text) return std::nullopt;
 
     // As open() does: a NUL would silently shorten the path the system sees.
@@ -139,19 +177,88 @@ std::optional<FileArgument> fileArgument(PyObject* args, const Call& call) {
     const Ref encoded(PyUnicode_EncodeFSDefault(text.get()));
     if (!encoded) return std::nullopt;
     std::string path(PyBytes_AS_STRING(encoded.get()), static_cast<std::size_t>(PyBytes_GET_SIZE(encoded.get())));
+    return PathArgument{std::move(text), std::move(path)};
+}
+
+// A file argument: its path, and the kind it is converted as.
+struct FileArgument {
+    PathArgument path;
+    core::FileKind kind;
+};
+
+// Parses the one path argument of a getter or diagnose() and checks its
+// extension; nullopt with an exception set when it is not acceptable.
+std::optional<FileArgument> fileArgument(PyObject* args, const Call& call) {
+    PyObject* argument = nullptr;
+    if (!PyArg_ParseTuple(args, call.format, &argument)) return std::nullopt;
+    std::optional<PathArgument> path = pathArgument(argument, call.name);
+    if (!path) return std::nullopt;
 
     if (call.kind) {
         const std::string extension(core::extensionOf(*call.kind));
-        if (core::hasExtension(path, extension)) return FileArgument{std::move(path), *call.kind};
+        if (core::hasExtension(path->path, extension)) return FileArgument{std::move(*path), *call.kind};
         PyErr_Format(moduleError, "%s() expects a path ending in \".%s\" (in any letter case), got %R", call.name,
-                     extension.c_str(), text.get());
+                     extension.c_str(), path->text.get());
         return std::nullopt;
     }
-    if (const std::optional<core::FileKind> kind = core::fileKindOf(path)) return FileArgument{std::move(path), *kind};
+    if (const std::optional<core::FileKind> kind = core::fileKindOf(path->path))
+        return FileArgument{std::move(*path), *kind};
     PyErr_Format(moduleError, "%s() expects a path ending in \".zelmat\" or \".zelopt\" (in any letter case), got %R",
-                 call.name, text.get());
+                 call.name, path->text.get());
     return std::nullopt;
 }
+
+// The kind= argument: "zelmat" or "zelopt". nullopt with an exception set for
+// anything else.
+std::optional<core::FileKind> kindArgument(PyObject* argument, const char* function) {
+    if (!PyUnicode_Check(argument)) {
+        PyErr_Format(PyExc_TypeError, "%s() argument 'kind' must be str, not %.200s", function,
+                     Py_TYPE(argument)->tp_name);
+        return std::nullopt;
+    }
+    for (core::FileKind kind : {core::FileKind::MaterialLibrary, core::FileKind::RenderOptions})
+        if (PyUnicode_CompareWithASCIIString(argument, std::string(core::extensionOf(kind)).c_str()) == 0) return kind;
+    PyErr_Format(PyExc_ValueError, "%s() argument 'kind' must be \"zelmat\" or \"zelopt\", not %R", function, argument);
+    return std::nullopt;
+}
+
+// A path argument with its kind: kind= when given, else the path's extension.
+std::optional<FileArgument> fileArgument(PyObject* argument, PyObject* kind, const char* function) {
+    std::optional<PathArgument> path = pathArgument(argument, function);
+    if (!path) return std::nullopt;
+    if (kind != Py_None) {
+        const std::optional<core::FileKind> given = kindArgument(kind, function);
+        if (!given) return std::nullopt;
+        return FileArgument{std::move(*path), *given};
+    }
+    if (const std::optional<core::FileKind> named = core::fileKindOf(path->path))
+        return FileArgument{std::move(*path), *named};
+    PyErr_Format(moduleError,
+                 "%s() expects a path ending in \".zelmat\" or \".zelopt\" (in any letter case) or a kind=, got %R",
+                 function, path->text.get());
+    return std::nullopt;
+}
+
+// The max_output= argument: None for the default budget, else a count of bytes
+// (0: no limit). False with an exception set when it is none of these.
+bool budgetArgument(PyObject* argument, const char* function, core::ConversionOptions& options) {
+    if (argument == Py_None) return true;
+    const Ref number(PyNumber_Index(argument));
+    if (!number) return false;
+    int overflow = 0;
+    const long long value = PyLong_AsLongLongAndOverflow(number.get(), &overflow);
+    if (overflow < 0 || (overflow == 0 && value < 0)) {
+        PyErr_Format(PyExc_ValueError, "%s() argument 'max_output' must not be negative, got %R", function,
+                     number.get());
+        return false;
+    }
+    const unsigned long long bytes = PyLong_AsUnsignedLongLong(number.get());
+    if (PyErr_Occurred()) return false;
+    options.maxOutput = bytes;
+    return true;
+}
+
+// ---- conversion ----------------------------------------------------------------
 
 // A document in a string whose conversion stops when a signal handler raises:
 // between pieces it runs the pending handlers (Ctrl-C's KeyboardInterrupt),
@@ -206,11 +313,12 @@ PyObject* textObject(std::string_view text) {
     return PyUnicode_DecodeUTF8(text.data(), static_cast<Py_ssize_t>(text.size()), "strict");
 }
 
-// The body of the conversion calls. C++ exceptions leave it only while the
-// interpreter lock is held.
-PyObject* convertFile(PyObject* args, const Call& call) {
-    std::optional<FileArgument> file = fileArgument(args, call);
-    if (!file) return nullptr;
+// Converts `input` with the interpreter lock released and returns the document
+// as a str: the XML, the pass-through text, or "" when the diagnosis in `result`
+// is not complete(). nullptr with an exception set when the str cannot be made
+// or a signal handler raised. C++ exceptions leave it only while the lock is held.
+PyObject* convertToStr(core::FileKind kind, const core::Input& input, const core::ConversionOptions& options,
+                       core::Diagnosis& result) {
     // Each thread keeps a small text buffer between calls, so converting many
     // small files does not map, fault in and unmap fresh memory for each; the
     // buffer of a larger document is let go, so that a pool of idle threads
@@ -227,54 +335,277 @@ PyObject* convertFile(PyObject* args, const Call& call) {
     // text and filling in the characters run while other threads do.
     std::string_view text;
     std::optional<python::StrShape> shape;
-    core::Diagnosis result;
     InterruptibleText sink(xml);
     withoutInterpreterLock(
         [&] {
-            result = core::convert(file->kind, std::filesystem::path(file->path), sink);
+            result = core::convert(kind, input, sink, options);
             text = core::text::upToFirstNul(xml);
             shape = python::measureUtf8(text);
         },
         &sink);
-    if (result.exceededBudget) {
-        raiseModuleError((file->path + ": the XML would exceed " + std::to_string(*result.exceededBudget) +
-                          " bytes (the output budget)").c_str());
-        return nullptr;
-    }
     PyObject* str = shape ? python::newStr(*shape) : textObject(text);
     if (str && shape) withoutInterpreterLock([&] { python::fillStr(str, text); });
     return str;
+}
+
+// The body of the getters: a file that cannot be opened gives "".
+PyObject* convertFile(PyObject* args, const Call& call) {
+    const std::optional<FileArgument> file = fileArgument(args, call);
+    if (!file) return nullptr;
+    core::Diagnosis result;
+    Ref str(convertToStr(file->kind, std::filesystem::path(file->path.path), {}, result));
+    if (!str) return nullptr;
+    if (result.exceededBudget) {
+        raiseModuleError((file->path.path + ": the XML would exceed " + std::to_string(*result.exceededBudget) +
+                          " bytes (the output budget)").c_str());
+        return nullptr;
+    }
+    return str.release();
 }
 
 PyObject* diagnoseFile(PyObject* args, const Call& call) {
     std::optional<FileArgument> file = fileArgument(args, call);
     if (!file) return nullptr;
     core::Diagnosis diagnosis;
-    withoutInterpreterLock([&] { diagnosis = core::diagnose(file->kind, std::filesystem::path(std::move(file->path))); });
+    withoutInterpreterLock(
+        [&] { diagnosis = core::diagnose(file->kind, std::filesystem::path(std::move(file->path.path))); });
     if (diagnosis.readsAsBinary) Py_RETURN_NONE;
     return textObject(diagnosis.reason());
 }
 
-template <PyObject* (*Body)(PyObject*, const Call&)>
-PyObject* guarded(PyObject* args, const Call& call) noexcept {
+// ---- what the newer calls raise ------------------------------------------------------
+
+// The OSError that open() raises for the file at `path`: FileNotFoundError,
+// PermissionError, IsADirectoryError... Its text is the system's words for the
+// errno when the system refused, else what the reader found (a FIFO is "not a
+// regular file", a file "changed while it was read").
+void raiseUnopened(const core::Diagnosis& result, PyObject* path) {
+    const int number = result.openError != 0 ? result.openError : EIO;
+    const std::string system = std::strerror(number);
+    const std::string reason = result.failure ? result.failure->reason : std::string();
+    const bool systemSaidIt =
+        reason.empty() || reason.ends_with(system) || core::text::equalsIgnoringAsciiCase(reason, system);
+    const std::string& words = systemSaidIt ? system : reason;
+    const Ref text(PyUnicode_DecodeLocale(words.c_str(), "surrogateescape"));
+    if (!text) return;
+    const Ref error(PyObject_CallFunction(PyExc_OSError, "iOO", number, text.get(), path ? path : Py_None));
+    if (error) PyErr_SetObject(reinterpret_cast<PyObject*>(Py_TYPE(error.get())), error.get());
+}
+
+// Dexmor.ReadError for a file (at `path`, or bytes when it is nullptr) that
+// does not read as binary, with the failure's parts as attributes.
+void raiseReadError(const core::Diagnosis& result, PyObject* path) {
+    const core::ReadFailure failure = result.failure.value_or(core::ReadFailure{"no reason was recorded", 0, {}});
+    const Ref why(lenientText(result.reason()));
+    const Ref reason(lenientText(failure.reason));
+    const Ref offset(PyLong_FromUnsignedLongLong(failure.offset));
+    const Ref records(PyList_New(0));
+    if (!why || !reason || !offset || !records) return;
+    for (std::string_view rest = failure.recordPath; !rest.empty();) {
+        const std::size_t separator = rest.find(" / ");
+        const Ref record(lenientText(rest.substr(0, separator)));
+        if (!record || PyList_Append(records.get(), record.get()) < 0) return;
+        rest = separator == std::string_view::npos ? std::string_view() : rest.substr(separator + 3);
+    }
+    const Ref message(path ? PyUnicode_FromFormat("%U: not readable as binary: %U", path, why.get())
+                           : PyUnicode_FromFormat("not readable as binary: %U", why.get()));
+    if (!message) return;
+    const Ref error(PyObject_CallOneArg(readError, message.get()));
+    if (!error) return;
+    if (PyObject_SetAttrString(error.get(), "path", path ? path : Py_None) < 0 ||
+        PyObject_SetAttrString(error.get(), "reason", reason.get()) < 0 ||
+        PyObject_SetAttrString(error.get(), "offset", offset.get()) < 0 ||
+        PyObject_SetAttrString(error.get(), "record_path", records.get()) < 0)
+        return;
+    PyErr_SetObject(readError, error.get());
+}
+
+// The result of a newer conversion call: the document, or (with the reason it
+// did not read) the pair; raised instead: the OSError of a file that cannot be
+// opened, Dexmor.error for a document over its budget, and with `strict`
+// Dexmor.ReadError for a file that does not read as binary.
+PyObject* conversionResult(const core::Diagnosis& result, Ref str, PyObject* path, bool strict, bool withDiagnosis) {
+    if (!result.opened) {
+        raiseUnopened(result, path);
+        return nullptr;
+    }
+    if (result.exceededBudget) {
+        const unsigned long long budget = *result.exceededBudget;
+        if (path)
+            PyErr_Format(moduleError, "%U: the XML would exceed %llu bytes (the output budget; max_output to change it)",
+                         path, budget);
+        else
+            PyErr_Format(moduleError, "the XML would exceed %llu bytes (the output budget; max_output to change it)",
+                         budget);
+        return nullptr;
+    }
+    if (strict && !result.readsAsBinary) {
+        raiseReadError(result, path);
+        return nullptr;
+    }
+    if (!withDiagnosis) return str.release();
+    const Ref reason(result.readsAsBinary ? Py_NewRef(Py_None) : lenientText(result.reason()));
+    return reason ? PyTuple_Pack(2, str.get(), reason.get()) : nullptr;
+}
+
+// The arguments of the newer calls beyond the path or the data.
+struct Keywords {
+    PyObject* kind = Py_None;
+    int strict = 0;
+    PyObject* maxOutput = Py_None;
+};
+
+PyObject* convertPath(const char* function, PyObject* argument, const Keywords& given, bool withDiagnosis) {
+    const std::optional<FileArgument> file = fileArgument(argument, given.kind, function);
+    core::ConversionOptions options;
+    if (!file || !budgetArgument(given.maxOutput, function, options)) return nullptr;
+    core::Diagnosis result;
+    Ref str(convertToStr(file->kind, std::filesystem::path(file->path.path), options, result));
+    if (!str) return nullptr;
+    return conversionResult(result, std::move(str), file->path.text.get(), given.strict != 0, withDiagnosis);
+}
+
+// The buffer is held, so a bytearray cannot be resized, until the call returns.
+PyObject* convertBuffer(const char* function, const HeldBuffer& data, const Keywords& given, bool withDiagnosis) {
+    const std::optional<core::FileKind> kind = kindArgument(given.kind, function);
+    core::ConversionOptions options;
+    if (!kind || !budgetArgument(given.maxOutput, function, options)) return nullptr;
+    core::Diagnosis result;
+    Ref str(convertToStr(*kind, data.input(), options, result));
+    if (!str) return nullptr;
+    return conversionResult(result, std::move(str), nullptr, given.strict != 0, withDiagnosis);
+}
+
+template <class Body>
+PyObject* guarded(Body&& body) noexcept {
     try {
-        return Body(args, call);
+        return body();
     } catch (...) {
         raiseFromCxx(std::current_exception());
         return nullptr;
     }
 }
 
-PyObject* getZelmatXml(PyObject*, PyObject* args) noexcept { return guarded<convertFile>(args, zelmatCall); }
-PyObject* getZeloptXml(PyObject*, PyObject* args) noexcept { return guarded<convertFile>(args, zeloptCall); }
-PyObject* diagnose(PyObject*, PyObject* args) noexcept { return guarded<diagnoseFile>(args, diagnoseCall); }
+PyObject* getZelmatXml(PyObject*, PyObject* args) noexcept {
+    return guarded([&] { return convertFile(args, zelmatCall); });
+}
+PyObject* getZeloptXml(PyObject*, PyObject* args) noexcept {
+    return guarded([&] { return convertFile(args, zeloptCall); });
+}
+PyObject* diagnose(PyObject*, PyObject* args) noexcept {
+    return guarded([&] { return diagnoseFile(args, diagnoseCall); });
+}
 
+// Keyword lists: "" marks a positional-only argument.
+char kPositional[] = "";
+char kKind[] = "kind";
+char kStrict[] = "strict";
+char kMaxOutput[] = "max_output";
+
+PyObject* convert(PyObject*, PyObject* args, PyObject* kwargs) noexcept {
+    return guarded([&]() -> PyObject* {
+        static char* names[] = {kPositional, kKind, kStrict, kMaxOutput, nullptr};
+        PyObject* path = nullptr;
+        Keywords given;
+        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "O|$OpO:convert", names, &path, &given.kind, &given.strict,
+                                         &given.maxOutput))
+            return nullptr;
+        return convertPath("convert", path, given, false);
+    });
+}
+
+PyObject* convertWithDiagnosis(PyObject*, PyObject* args, PyObject* kwargs) noexcept {
+    return guarded([&]() -> PyObject* {
+        static char* names[] = {kPositional, kKind, kMaxOutput, nullptr};
+        PyObject* path = nullptr;
+        Keywords given;
+        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "O|$OO:convertWithDiagnosis", names, &path, &given.kind,
+                                         &given.maxOutput))
+            return nullptr;
+        return convertPath("convertWithDiagnosis", path, given, true);
+    });
+}
+
+PyObject* convertBytes(PyObject*, PyObject* args, PyObject* kwargs) noexcept {
+    return guarded([&]() -> PyObject* {
+        static char* names[] = {kPositional, kKind, kStrict, kMaxOutput, nullptr};
+        HeldBuffer data;
+        Keywords given;
+        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "y*O|$pO:convertBytes", names, &data.view, &given.kind,
+                                         &given.strict, &given.maxOutput))
+            return nullptr;
+        return convertBuffer("convertBytes", data, given, false);
+    });
+}
+
+PyObject* convertBytesWithDiagnosis(PyObject*, PyObject* args, PyObject* kwargs) noexcept {
+    return guarded([&]() -> PyObject* {
+        static char* names[] = {kPositional, kKind, kMaxOutput, nullptr};
+        HeldBuffer data;
+        Keywords given;
+        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "y*O|$O:convertBytesWithDiagnosis", names, &data.view,
+                                         &given.kind, &given.maxOutput))
+            return nullptr;
+        return convertBuffer("convertBytesWithDiagnosis", data, given, true);
+    });
+}
+
+PyObject* diagnoseBytes(PyObject*, PyObject* args, PyObject* kwargs) noexcept {
+    return guarded([&]() -> PyObject* {
+        static char* names[] = {kPositional, kKind, nullptr};
+        HeldBuffer data;
+        PyObject* kindObject = nullptr;
+        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "y*O:diagnoseBytes", names, &data.view, &kindObject))
+            return nullptr;
+        const std::optional<core::FileKind> kind = kindArgument(kindObject, "diagnoseBytes");
+        if (!kind) return nullptr;
+        core::Diagnosis diagnosis;
+        withoutInterpreterLock([&] { diagnosis = core::diagnose(*kind, data.input()); });
+        if (diagnosis.readsAsBinary) Py_RETURN_NONE;
+        return textObject(diagnosis.reason());
+    });
+}
+
+template <PyObject* (*Function)(PyObject*, PyObject*, PyObject*) noexcept>
+PyCFunction withKeywords() {
+    return reinterpret_cast<PyCFunction>(reinterpret_cast<void (*)()>(Function));
+}
+
+// The first line of each newer docstring is its signature, for inspect.signature().
 PyMethodDef methods[] = {
     {"getZelmatXml", getZelmatXml, METH_VARARGS, "Gets the xml from a zelmat file."},
     {"getZeloptXml", getZeloptXml, METH_VARARGS, "Gets the xml from a zelopt file."},
     {"diagnose", diagnose, METH_VARARGS,
-     "diagnose(path) -> str | None\n\nNone when the file reads as a binary file of the kind its extension names\n"
+     "diagnose($module, path, /)\n--\n\n"
+     "None when the file reads as a binary file of the kind its extension names\n"
      "(.zelmat or .zelopt); otherwise why not: the record, the byte offset and what\nwas wrong there."},
+    {"convert", withKeywords<convert>(), METH_VARARGS | METH_KEYWORDS,
+     "convert($module, path, /, *, kind=None, strict=False, max_output=None)\n--\n\n"
+     "The XML document of the file at `path`, of the kind its extension names\n"
+     "(.zelmat or .zelopt, any letter case) unless kind= (\"zelmat\" or \"zelopt\") says.\n"
+     "A file that does not read as binary comes back as its own text; with strict=True\n"
+     "it raises ReadError instead. A file that cannot be opened raises what open()\n"
+     "raises (FileNotFoundError, PermissionError, IsADirectoryError...). max_output is\n"
+     "the output budget in bytes (None: the larger of 256 MiB and 1,000 times the\n"
+     "file's size; 0: none); a document over it raises error."},
+    {"convertWithDiagnosis", withKeywords<convertWithDiagnosis>(), METH_VARARGS | METH_KEYWORDS,
+     "convertWithDiagnosis($module, path, /, *, kind=None, max_output=None)\n--\n\n"
+     "(text, reason) from one reading of the file at `path`: text as convert() returns\n"
+     "it, and reason None when the file read as binary, else why it did not (as\n"
+     "diagnose() gives it). Raises as convert() does."},
+    {"convertBytes", withKeywords<convertBytes>(), METH_VARARGS | METH_KEYWORDS,
+     "convertBytes($module, data, /, kind, *, strict=False, max_output=None)\n--\n\n"
+     "The XML document of a file's bytes held in memory (bytes, bytearray, memoryview\n"
+     "or any contiguous buffer), converted in place as kind (\"zelmat\" or \"zelopt\").\n"
+     "Otherwise as convert(); ReadError.path is None."},
+    {"convertBytesWithDiagnosis", withKeywords<convertBytesWithDiagnosis>(), METH_VARARGS | METH_KEYWORDS,
+     "convertBytesWithDiagnosis($module, data, /, kind, *, max_output=None)\n--\n\n"
+     "(text, reason) from one reading of a file's bytes, as convertWithDiagnosis()\n"
+     "gives them for a file."},
+    {"diagnoseBytes", withKeywords<diagnoseBytes>(), METH_VARARGS | METH_KEYWORDS,
+     "diagnoseBytes($module, data, /, kind)\n--\n\n"
+     "None when the bytes read as a binary file of kind (\"zelmat\" or \"zelopt\");\n"
+     "otherwise why not, as diagnose() says it."},
     {nullptr, nullptr, 0, nullptr},
 };
 
@@ -290,30 +621,32 @@ PyModuleDef moduleDefinition = {
     nullptr,  // m_free
 };
 
+// Adds a new exception class to the module and keeps a reference in `slot`.
+bool addException(PyObject* module, const char* name, const char* qualifiedName, const char* doc, PyObject* base,
+                  PyObject*& slot) {
+    PyObject* type = PyErr_NewExceptionWithDoc(qualifiedName, doc, base, nullptr);
+    if (!type) return false;
+    if (PyModule_AddObjectRef(module, name, type) < 0) {
+        Py_DECREF(type);
+        return false;
+    }
+    Py_XSETREF(slot, type);
+    return true;
+}
+
 } // namespace
 
 PyMODINIT_FUNC PyInit_Dexmor() {
     PyObject* module = PyModule_Create(&moduleDefinition);
     if (!module) return nullptr;
-    if (PyModule_AddStringConstant(module, "__version__", DEXMOR_VERSION_STRING) < 0) {
+    if (PyModule_AddStringConstant(module, "__version__", DEXMOR_VERSION_STRING) < 0 ||
+        !addException(module, "error", "Dexmor.error", nullptr, nullptr, moduleError) ||
+        !addException(module, "ReadError", "Dexmor.ReadError",
+                      "A file that does not read as binary, in a strict conversion. Attributes: path\n"
+                      "(None for bytes), reason, offset and record_path (a list of str).",
+                      moduleError, readError)) {
         Py_DECREF(module);
         return nullptr;
     }
-
-    PyObject* error = PyErr_NewException("Dexmor.error", nullptr, nullptr);
-    if (!error) {
-        Py_DECREF(module);
-        return nullptr;
-    }
-    Py_INCREF(error); // the module attribute's reference; PyModule_AddObject takes it on success
-    if (PyModule_AddObject(module, "error", error) < 0) {
-        Py_DECREF(error);
-        Py_DECREF(error);
-        Py_DECREF(module);
-        return nullptr;
-    }
-    PyObject* previous = moduleError;
-    moduleError = error;
-    Py_XDECREF(previous);
     return module;
 }

@@ -1,9 +1,13 @@
-"""examples/convert_on_dask.py on a local cluster of two worker processes: every
-output equals what the module returns for the file, and the summary lists
-exactly the files that passed through as text. Then one conversion in this
-process, in an output folder where others have planted links."""
+"""examples/convert_on_dask.py on a local cluster of two worker processes, with
+the workers reading the files or (--send-bytes) this process: every output equals
+what the module returns for the file, and the summary lists exactly the files
+that passed through as text. Then, in this process, that each file is read once,
+and one conversion in an output folder where others have planted links."""
+import builtins
+import collections
 import errno
 import importlib.util
+import logging
 import os
 import pathlib
 import shutil
@@ -60,7 +64,8 @@ def make_inputs(folder):
     return set(fallbacks)
 
 
-def test_converts_a_folder_on_two_worker_processes(tmp_path):
+@pytest.mark.parametrize("mode", [[], ["--send-bytes"]], ids=["paths", "send-bytes"])
+def test_converts_a_folder_on_two_worker_processes(tmp_path, mode):
     inputs, out, elsewhere = tmp_path / "in", tmp_path / "out", tmp_path / "elsewhere"
     inputs.mkdir()
     elsewhere.mkdir()
@@ -74,7 +79,7 @@ def test_converts_a_folder_on_two_worker_processes(tmp_path):
     (elsewhere / "notes.txt").write_text("x")
     refused = [elsewhere / "empty.zelopt", elsewhere / "notes.txt", elsewhere / "missing.zelmat"]
 
-    run = subprocess.run([sys.executable, str(SCRIPT), "--workers", "2", "--batch-size", "4", "-o", str(out),
+    run = subprocess.run([sys.executable, str(SCRIPT), *mode, "--workers", "2", "--batch-size", "4", "-o", str(out),
                           str(inputs), *map(str, refused)], capture_output=True, text=True, timeout=600)
     assert run.returncode == 1, run.stderr
     assert run.stdout.startswith("50 of 50 files converted on 2 workers"), run.stdout
@@ -98,17 +103,78 @@ def test_converts_a_folder_on_two_worker_processes(tmp_path):
     assert set(listed) == fallbacks
     for name, (reason, size) in listed.items():
         assert size == len(convert(inputs / name).encode("utf-8"))
-        if hasattr(Dexmor, "diagnose"):
-            assert reason == " ".join(Dexmor.diagnose(str(inputs / name)).split())
+        assert reason == " ".join(Dexmor.diagnose(str(inputs / name)).split())
+
+
+def load_script():
+    spec = importlib.util.spec_from_file_location("convert_on_dask", SCRIPT)
+    script = importlib.util.module_from_spec(spec)
+    spec.loader.exec_module(script)
+    return script
+
+
+@pytest.mark.filterwarnings("ignore:make_current is deprecated:DeprecationWarning")
+@pytest.mark.parametrize("mode", [[], ["--send-bytes"]], ids=["paths", "send-bytes"])
+def test_each_file_is_read_once(tmp_path, monkeypatch, mode):
+    """On a cluster of one thread in this process: every file is read once, by the
+    worker's one call of the module or, with --send-bytes, by this process's one
+    open(); a file that cannot be opened fails and gets no output."""
+    from distributed import Client, LocalCluster
+
+    script = load_script()
+    inputs, out = tmp_path / "in", tmp_path / "out"
+    inputs.mkdir()
+    out.mkdir()
+    make_inputs(inputs)
+    files = sorted(str(p) for p in inputs.iterdir() if p.is_file() and p.suffix.lower() in (".zelmat", ".zelopt"))
+    gone = str(inputs / "gone.zelmat")
+
+    reads, bytes_calls = collections.Counter(), []
+
+    def recording(function):
+        def call(first, *args, **kwargs):
+            if isinstance(first, (bytes, bytearray, memoryview)):
+                bytes_calls.append(function.__name__)
+            else:
+                reads[os.fspath(first)] += 1
+            return function(first, *args, **kwargs)
+        return call
+
+    for name in dir(Dexmor):
+        if not name.startswith("_") and not isinstance(getattr(Dexmor, name), type):
+            monkeypatch.setattr(Dexmor, name, recording(getattr(Dexmor, name)))
+    real_open = builtins.open
+
+    def counting_open(file, *args, **kwargs):
+        if isinstance(file, (str, os.PathLike)):
+            reads[os.fspath(file)] += 1
+        return real_open(file, *args, **kwargs)
+
+    monkeypatch.setattr(builtins, "open", counting_open)
+
+    def in_this_process(args):
+        cluster = LocalCluster(n_workers=1, threads_per_worker=1, processes=False, dashboard_address=None,
+                               silence_logs=logging.ERROR)
+        return Client(cluster), cluster
+
+    monkeypatch.setattr(script, "connect", in_this_process)
+    jobs, _ = script.plan(files + [gone], str(out))
+    results, _ = script.run(jobs, script.parse_arguments([*mode, "--batch-size", "4", "-o", str(out), "in"]))
+    monkeypatch.undo()
+
+    assert {path: reads[path] for path in files} == dict.fromkeys(files, 1)
+    assert bytes_calls == (["convertBytesWithDiagnosis"] * len(files) if mode else [])
+    outcomes = {source: (outcome, detail) for source, outcome, detail, _ in results}
+    assert len(results) == len(outcomes) == len(files) + 1
+    assert outcomes[gone][0] == "failed" and outcomes[gone][1].startswith("FileNotFoundError"), outcomes[gone]
+    assert sorted(os.listdir(out)) == sorted(os.path.basename(f) + ".xml" for f in files)
 
 
 def test_output_folder_with_planted_links(tmp_path, monkeypatch):
     """Links planted at names the temporary file could take are neither written
     through nor renamed onto the target, which gets the mode a plain open gives;
     a write that fails leaves the previous target and no temporary file."""
-    spec = importlib.util.spec_from_file_location("convert_on_dask", SCRIPT)
-    script = importlib.util.module_from_spec(spec)
-    spec.loader.exec_module(script)
+    script = load_script()
     sample = SOURCE / "examples" / "sample.zelmat"
     expected = convert(sample).encode("utf-8")
     victim, out = tmp_path / "victim", tmp_path / "out"

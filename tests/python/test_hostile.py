@@ -59,6 +59,9 @@ def test_output_budget_stops_the_tool_with_bounded_memory(amplifier, tmp_path):
 def test_output_budget_raises_in_the_module(amplifier):
     with pytest.raises(Dexmor.error, match=r"amplifier.zelmat: the XML would exceed 268435456 bytes"):
         Dexmor.getZelmatXml(str(amplifier))
+    with pytest.raises(Dexmor.error) as raised:
+        Dexmor.convertBytes(amplifier.read_bytes(), "zelmat")
+    assert str(raised.value) == "the XML would exceed 268435456 bytes (the output budget; max_output to change it)"
 
 
 def test_a_file_whose_size_lies_keeps_the_previous_output(tmp_path):
@@ -146,16 +149,22 @@ def test_the_deepest_chain_converts_on_a_128_kib_thread(tmp_path):
     assert results == [expected]
 
 
-def test_ctrl_c_interrupts_a_long_call_promptly(amplifier):
+# Under the sanitizers a conversion needs more stack than the main thread has, so
+# it runs on a thread of its own, where signal handlers cannot run.
+@pytest.mark.skipif("LD_PRELOAD" in os.environ, reason="the conversion leaves the main thread under the sanitizers")
+@pytest.mark.parametrize("call", ["Dexmor.getZelmatXml(path)", "Dexmor.convert(path, max_output=0)",
+                                  "Dexmor.convertBytes(open(path, 'rb').read(), 'zelmat', max_output=0)"])
+def test_ctrl_c_interrupts_a_long_call_promptly(amplifier, call):
     program = textwrap.dedent(f"""
         import os, signal, threading, time, Dexmor
+        path = {str(amplifier)!r}
         fired = []
         def interrupt():
             fired.append(time.monotonic())
             os.kill(os.getpid(), signal.SIGINT)
         threading.Timer(0.2, interrupt).start()
         try:
-            Dexmor.getZelmatXml({str(amplifier)!r})
+            {call}
             print("finished")
         except KeyboardInterrupt:
             print("interrupted after", time.monotonic() - fired[0])
