@@ -149,9 +149,6 @@ def test_the_deepest_chain_converts_on_a_128_kib_thread(tmp_path):
     assert results == [expected]
 
 
-# Under the sanitizers a conversion needs more stack than the main thread has, so
-# it runs on a thread of its own, where signal handlers cannot run.
-@pytest.mark.skipif("LD_PRELOAD" in os.environ, reason="the conversion leaves the main thread under the sanitizers")
 @pytest.mark.parametrize("call", ["Dexmor.getZelmatXml(path)", "Dexmor.convert(path, max_output=0)",
                                   "Dexmor.convertBytes(open(path, 'rb').read(), 'zelmat', max_output=0)"])
 def test_ctrl_c_interrupts_a_long_call_promptly(amplifier, call):
