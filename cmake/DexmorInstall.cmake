@@ -6,7 +6,9 @@
 #   lib/cmake/Dexmor/                  find_package(Dexmor CONFIG) with the target Dexmor::core
 #   lib/pkgconfig/dexmor.pc            for pkg-config
 #   bin/dexmor, share/man/man1/dexmor.1
-#   <DEXMOR_PYTHON_INSTALL_DIR>/       the module Dexmor and its type stub Dexmor.pyi
+#   the module Dexmor and its type stub Dexmor.pyi: in the user site when the prefix
+#   is the user base (~/.local), else in the interpreter's folder under the prefix
+#   (cmake/python_install_dir.py), or in DEXMOR_PYTHON_INSTALL_DIR
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 
@@ -63,26 +65,27 @@ install(FILES ${PROJECT_BINARY_DIR}/docs/dexmor.1 DESTINATION ${CMAKE_INSTALL_MA
 
 # ---- the Python module --------------------------------------------------------------
 if(TARGET Dexmor)
-  # The interpreter's own directory for extension modules, relative to its prefix
-  # so that it lands under the prefix given at install time (on Debian
-  # lib/python3.X/dist-packages, which is on the path under /usr and /usr/local).
+  # Where the module goes depends on the prefix given at install time (see
+  # python_install_dir.py: the user site for the user base, else the
+  # interpreter's directory under the prefix), so it is found then, unless
+  # DEXMOR_PYTHON_INSTALL_DIR names a folder.
   get_directory_property(python DIRECTORY ${PROJECT_SOURCE_DIR}/module DEFINITION Python3_EXECUTABLE)
-  execute_process(
-    COMMAND ${python} -c [=[
-import os, sys, sysconfig
-scheme = sysconfig.get_default_scheme() if hasattr(sysconfig, "get_default_scheme") else sysconfig._get_default_scheme()
-# Debian's default scheme puts an interpreter of prefix /usr at /usr/local.
-base = os.path.join(sys.prefix, "local") if scheme == "posix_local" else sys.prefix
-print(os.path.relpath(sysconfig.get_path("platlib", scheme), base), end="")
-]=]
-    OUTPUT_VARIABLE python_site RESULT_VARIABLE python_failed)
-  if(python_failed OR python_site MATCHES "^\\.\\.")
-    get_directory_property(python_site DIRECTORY ${PROJECT_SOURCE_DIR}/module DEFINITION Python3_SITEARCH)
+  set(DEXMOR_PYTHON_INSTALL_DIR "" CACHE STRING
+      "Where the Python module goes: relative to the install prefix, or absolute; empty: chosen for the prefix at install time")
+  if(DEXMOR_PYTHON_INSTALL_DIR)
+    install(TARGETS Dexmor LIBRARY DESTINATION ${DEXMOR_PYTHON_INSTALL_DIR} COMPONENT Python)
+    install(FILES ${PROJECT_SOURCE_DIR}/module/Dexmor.pyi DESTINATION ${DEXMOR_PYTHON_INSTALL_DIR} COMPONENT Python)
+  else()
+    install(CODE "
+      execute_process(COMMAND \"${python}\" \"${CMAKE_CURRENT_LIST_DIR}/python_install_dir.py\" \"\${CMAKE_INSTALL_PREFIX}\"
+                      OUTPUT_VARIABLE dexmor_python_dir RESULT_VARIABLE failed)
+      if(failed OR NOT dexmor_python_dir)
+        message(FATAL_ERROR \"cannot tell where ${python} looks for modules under \${CMAKE_INSTALL_PREFIX}\")
+      endif()
+      file(INSTALL DESTINATION \"\${dexmor_python_dir}\" TYPE MODULE FILES \"$<TARGET_FILE:Dexmor>\")
+      file(INSTALL DESTINATION \"\${dexmor_python_dir}\" TYPE FILE FILES \"${PROJECT_SOURCE_DIR}/module/Dexmor.pyi\")
+    " COMPONENT Python)
   endif()
-  set(DEXMOR_PYTHON_INSTALL_DIR "${python_site}" CACHE STRING
-      "Where the Python module goes: relative to the install prefix, or absolute")
-  install(TARGETS Dexmor LIBRARY DESTINATION ${DEXMOR_PYTHON_INSTALL_DIR} COMPONENT Python)
-  install(FILES ${PROJECT_SOURCE_DIR}/module/Dexmor.pyi DESTINATION ${DEXMOR_PYTHON_INSTALL_DIR} COMPONENT Python)
   # Beside the built module too, for editors pointed at <build>/python.
   configure_file(${PROJECT_SOURCE_DIR}/module/Dexmor.pyi ${PROJECT_BINARY_DIR}/python/Dexmor.pyi COPYONLY)
 endif()

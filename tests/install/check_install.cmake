@@ -3,7 +3,9 @@
 #   2. the installed dexmor converts SAMPLE (the reference for what follows);
 #   3. a CMake project finds the package with find_package(Dexmor) and links Dexmor::core;
 #   4. the same program is compiled with nothing but the flags pkg-config gives;
-#   5. the module imports from the installed site-packages directory.
+#   5. the module imports from the installed site-packages directory;
+#   6. installed with --prefix ~/.local (HOME pointed at a fresh folder), the module
+#      imports from the user site with no path set.
 # Each program's document must equal the installed tool's, byte for byte.
 #
 # Variables: BUILD_DIR, WORK_DIR, SOURCE_DIR, SAMPLE, CXX, GENERATOR, MAKE_PROGRAM,
@@ -95,20 +97,41 @@ else()
 endif()
 
 # 5. The module from site-packages, with its stub beside it.
-if(PYTHON AND IS_ABSOLUTE "${PYTHON_DIR}")
-  message(STATUS "the module is installed outside the prefix (${PYTHON_DIR}): not checked")
-elseif(PYTHON)
-  set(site ${prefix}/${PYTHON_DIR})
-  set(env PYTHONPATH=${site} PYTHONDONTWRITEBYTECODE=1)
+if(PYTHON)
+  set(python_env PYTHONDONTWRITEBYTECODE=1)
   if(SANITIZER_RUNTIME)
-    # The interpreter is not instrumented: the runtime must be loaded first.
-    list(APPEND env LD_PRELOAD=${SANITIZER_RUNTIME} ASAN_OPTIONS=detect_leaks=0)
+    # The interpreter is not instrumented: the runtimes must be loaded first.
+    list(APPEND python_env LD_PRELOAD=${SANITIZER_RUNTIME} ASAN_OPTIONS=detect_leaks=0)
   endif()
-  expect_reference(installed-module ${CMAKE_COMMAND} -E env ${env} ${PYTHON} -s -c [=[
+  set(check_module [=[
 import os, sys, Dexmor
 site = os.path.realpath(sys.argv[1])
 assert os.path.dirname(os.path.realpath(Dexmor.__file__)) == site, Dexmor.__file__
 assert os.path.isfile(os.path.join(site, "Dexmor.pyi")), "no Dexmor.pyi beside the module"
 sys.stdout.buffer.write(Dexmor.getZelmatXml(sys.argv[2]).encode("utf-8"))
-]=] ${site} ${SAMPLE})
+]=])
+  if(PYTHON_DIR)
+    set(site ${prefix}/${PYTHON_DIR})
+  else()
+    run(${PYTHON} ${SOURCE_DIR}/../../cmake/python_install_dir.py ${prefix})
+    set(site ${run_output})
+  endif()
+  expect_reference(installed-module ${CMAKE_COMMAND} -E env ${python_env} PYTHONPATH=${site}
+                   ${PYTHON} -s -c ${check_module} ${site} ${SAMPLE})
+
+  # 6. Installed into the user base (~/.local), the module imports with no path set.
+  if(NOT PYTHON_DIR)
+    set(home ${WORK_DIR}/home)
+    file(MAKE_DIRECTORY ${home})
+    run(${CMAKE_COMMAND} -E env HOME=${home} --unset=PYTHONUSERBASE
+        ${CMAKE_COMMAND} --install ${BUILD_DIR} --prefix ${home}/.local --component Python)
+    run(${CMAKE_COMMAND} -E env HOME=${home} --unset=PYTHONUSERBASE ${PYTHON} -m site --user-site)
+    string(STRIP "${run_output}" user_site)
+    if(NOT user_site MATCHES "^${home}/")
+      message(FATAL_ERROR "the user site ${user_site} is not under HOME=${home}")
+    endif()
+    expect_reference(user-site-module ${CMAKE_COMMAND} -E env HOME=${home} --unset=PYTHONUSERBASE
+                     --unset=PYTHONPATH --unset=PYTHONNOUSERSITE ${python_env}
+                     ${PYTHON} -c ${check_module} ${user_site} ${SAMPLE})
+  endif()
 endif()
