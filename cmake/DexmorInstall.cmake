@@ -6,7 +6,8 @@
 #   lib/cmake/Dexmor/                  find_package(Dexmor CONFIG) with the target Dexmor::core
 #   lib/pkgconfig/dexmor.pc            for pkg-config
 #   bin/dexmor, share/man/man1/dexmor.1
-#   the module Dexmor and its type stub Dexmor.pyi: in the user site when the prefix
+#   the module Dexmor, its type stub Dexmor.pyi and the stub package Dexmor-stubs
+#   (found by type checkers): in the user site when the prefix
 #   is the user base (~/.local), else in the interpreter's folder under the prefix
 #   (cmake/python_install_dir.py), or in DEXMOR_PYTHON_INSTALL_DIR
 include(GNUInstallDirs)
@@ -62,6 +63,8 @@ install(FILES ${PROJECT_BINARY_DIR}/package/dexmor.pc
 # ---- the tool and its manual page --------------------------------------------------
 install(TARGETS dexmor RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT Runtime)
 install(FILES ${PROJECT_BINARY_DIR}/docs/dexmor.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT Runtime)
+install(FILES ${PROJECT_SOURCE_DIR}/LICENSE ${PROJECT_SOURCE_DIR}/CHANGELOG.md ${PROJECT_SOURCE_DIR}/README.md
+        DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT Runtime)
 
 # ---- the Python module --------------------------------------------------------------
 if(TARGET Dexmor)
@@ -75,6 +78,8 @@ if(TARGET Dexmor)
   if(DEXMOR_PYTHON_INSTALL_DIR)
     install(TARGETS Dexmor LIBRARY DESTINATION ${DEXMOR_PYTHON_INSTALL_DIR} COMPONENT Python)
     install(FILES ${PROJECT_SOURCE_DIR}/module/Dexmor.pyi DESTINATION ${DEXMOR_PYTHON_INSTALL_DIR} COMPONENT Python)
+    install(FILES ${PROJECT_SOURCE_DIR}/module/Dexmor.pyi DESTINATION ${DEXMOR_PYTHON_INSTALL_DIR}/Dexmor-stubs
+            RENAME __init__.pyi COMPONENT Python)
   else()
     install(CODE "
       execute_process(COMMAND \"${python}\" \"${CMAKE_CURRENT_LIST_DIR}/python_install_dir.py\" \"\${CMAKE_INSTALL_PREFIX}\"
@@ -84,8 +89,12 @@ if(TARGET Dexmor)
       endif()
       file(INSTALL DESTINATION \"\${dexmor_python_dir}\" TYPE MODULE FILES \"$<TARGET_FILE:Dexmor>\")
       file(INSTALL DESTINATION \"\${dexmor_python_dir}\" TYPE FILE FILES \"${PROJECT_SOURCE_DIR}/module/Dexmor.pyi\")
+      file(INSTALL DESTINATION \"\${dexmor_python_dir}/Dexmor-stubs\" TYPE FILE
+           FILES \"${PROJECT_BINARY_DIR}/python/Dexmor-stubs/__init__.pyi\")
     " COMPONENT Python)
   endif()
-  # Beside the built module too, for editors pointed at <build>/python.
+  # Beside the built module too, for editors pointed at <build>/python, and as the
+  # stub package that type checkers look for (a stub beside an extension they skip).
   configure_file(${PROJECT_SOURCE_DIR}/module/Dexmor.pyi ${PROJECT_BINARY_DIR}/python/Dexmor.pyi COPYONLY)
+  configure_file(${PROJECT_SOURCE_DIR}/module/Dexmor.pyi ${PROJECT_BINARY_DIR}/python/Dexmor-stubs/__init__.pyi COPYONLY)
 endif()

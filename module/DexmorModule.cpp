@@ -573,8 +573,10 @@ PyCFunction withKeywords() {
 
 // The first line of each newer docstring is its signature, for inspect.signature().
 PyMethodDef methods[] = {
-    {"getZelmatXml", getZelmatXml, METH_VARARGS, "Gets the xml from a zelmat file."},
-    {"getZeloptXml", getZeloptXml, METH_VARARGS, "Gets the xml from a zelopt file."},
+    // The lines before "--" are the signature inspect and help() show; __doc__ is
+    // what follows, the documented first line unchanged.
+    {"getZelmatXml", getZelmatXml, METH_VARARGS, "getZelmatXml($module, path, /)\n--\n\nGets the xml from a zelmat file."},
+    {"getZeloptXml", getZeloptXml, METH_VARARGS, "getZeloptXml($module, path, /)\n--\n\nGets the xml from a zelopt file."},
     {"diagnose", diagnose, METH_VARARGS,
      "diagnose($module, path, /)\n--\n\n"
      "None when the file reads as a binary file of the kind its extension names\n"
@@ -609,10 +611,22 @@ PyMethodDef methods[] = {
     {nullptr, nullptr, 0, nullptr},
 };
 
+const char moduleDoc[] =
+    "Material libraries (.zelmat) and render-options files (.zelopt) as XML asset documents.\n"
+    "\n"
+    "getZelmatXml(path) and getZeloptXml(path) return a file's document, or the\n"
+    "file's own text when it does not read as binary (\"\" when it cannot be opened).\n"
+    "convert(path, ...) and convertBytes(data, kind, ...) never let a failure look\n"
+    "like a document: they raise what open() raises, and with strict=True raise\n"
+    "ReadError for a file that does not read as binary; diagnose(path) tells why a\n"
+    "file does not read. Every document is held to an output budget (max_output).\n"
+    "\n"
+    "See help(Dexmor.convert) for the options.";
+
 PyModuleDef moduleDefinition = {
     PyModuleDef_HEAD_INIT,
     "Dexmor", // m_name
-    nullptr,  // m_doc: the module has no docstring
+    moduleDoc, // m_doc
     -1,       // m_size: state lives in statics
     methods,  // m_methods
     nullptr,  // m_slots

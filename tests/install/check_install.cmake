@@ -108,6 +108,7 @@ import os, sys, Dexmor
 site = os.path.realpath(sys.argv[1])
 assert os.path.dirname(os.path.realpath(Dexmor.__file__)) == site, Dexmor.__file__
 assert os.path.isfile(os.path.join(site, "Dexmor.pyi")), "no Dexmor.pyi beside the module"
+assert os.path.isfile(os.path.join(site, "Dexmor-stubs", "__init__.pyi")), "no stub package Dexmor-stubs"
 sys.stdout.buffer.write(Dexmor.getZelmatXml(sys.argv[2]).encode("utf-8"))
 ]=])
   if(PYTHON_DIR)

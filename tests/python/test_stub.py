@@ -1,8 +1,14 @@
 """The type stub Dexmor.pyi describes exactly the module's public names, each
-with its documentation, and the copy beside the built module is current."""
+with its documentation; the copies beside the built module and as the stub
+package Dexmor-stubs are current; and type checkers find and apply it."""
 import ast
+import importlib.util
 import os
 import pathlib
+import subprocess
+import sys
+
+import pytest
 
 import Dexmor
 
@@ -33,3 +39,58 @@ def test_stub_documents_everything_and_types_match():
 def test_copy_beside_the_module_is_current():
     beside = pathlib.Path(Dexmor.__file__).with_name("Dexmor.pyi")
     assert beside.read_bytes() == STUB.read_bytes()
+    assert (beside.parent / "Dexmor-stubs" / "__init__.pyi").read_bytes() == STUB.read_bytes()
+
+
+# A program using every call as a typed caller would; mypy --strict must accept
+# it, and must reject the misuse below it.
+TYPED_PROGRAM = """
+import os
+import pathlib
+from typing import Optional, Tuple
+
+import Dexmor
+
+path = pathlib.Path("lib.zelmat")
+a: str = Dexmor.getZelmatXml(path)
+b: str = Dexmor.getZeloptXml("scene.zelopt")
+c: Optional[str] = Dexmor.diagnose(os.fspath(path))
+d: str = Dexmor.convert(path, kind="zelmat", strict=True, max_output=0)
+e: Tuple[str, Optional[str]] = Dexmor.convertWithDiagnosis("lib.zelmat", max_output=None)
+f: str = Dexmor.convertBytes(b"...", "zelopt", strict=False)
+g: Tuple[str, Optional[str]] = Dexmor.convertBytesWithDiagnosis(bytearray(b"..."), "zelmat")
+h: Optional[str] = Dexmor.diagnoseBytes(memoryview(b"..."), "zelmat")
+version: str = Dexmor.__version__
+try:
+    Dexmor.convert(path, strict=True)
+except Dexmor.ReadError as failure:
+    where: Optional[str] = failure.path
+    offset: int = failure.offset
+    records: list[str] = failure.record_path
+    reason: str = failure.reason
+except Dexmor.error:
+    pass
+"""
+
+
+def run_mypy(tmp_path, program):
+    source = tmp_path / "typed.py"
+    source.write_text(program, encoding="utf-8")
+    return subprocess.run([sys.executable, "-m", "mypy", "--strict", "--no-incremental", "--cache-dir", os.devnull,
+                           str(source)], capture_output=True, text=True, timeout=300, cwd=tmp_path)
+
+
+@pytest.mark.skipif(importlib.util.find_spec("mypy") is None, reason="mypy is not installed")
+def test_mypy_finds_the_stub_package_and_checks_callers(tmp_path):
+    run = run_mypy(tmp_path, TYPED_PROGRAM)
+    assert run.returncode == 0, run.stdout + run.stderr
+    run = run_mypy(tmp_path, "import Dexmor\nx: int = Dexmor.convert(b'lib.zelmat')\n")
+    assert run.returncode == 1
+    assert "incompatible type" in run.stdout and "Incompatible types in assignment" in run.stdout
+
+
+@pytest.mark.skipif(importlib.util.find_spec("mypy") is None, reason="mypy is not installed")
+def test_stubtest_finds_the_stub_true_to_the_module():
+    run = subprocess.run([sys.executable, "-m", "mypy.stubtest", "Dexmor"], capture_output=True, text=True,
+                         timeout=300)
+    assert run.returncode == 0, run.stdout + run.stderr
