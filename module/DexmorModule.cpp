@@ -611,22 +611,10 @@ PyMethodDef methods[] = {
     {nullptr, nullptr, 0, nullptr},
 };
 
-const char moduleDoc[] =
-    "Material libraries (.zelmat) and render-options files (.zelopt) as XML asset documents.\n"
-    "\n"
-    "getZelmatXml(path) and getZeloptXml(path) return a file's document, or the\n"
-    "file's own text when it does not read as binary (\"\" when it cannot be opened).\n"
-    "convert(path, ...) and convertBytes(data, kind, ...) never let a failure look\n"
-    "like a document: they raise what open() raises, and with strict=True raise\n"
-    "ReadError for a file that does not read as binary; diagnose(path) tells why a\n"
-    "file does not read. Every document is held to an output budget (max_output).\n"
-    "\n"
-    "See help(Dexmor.convert) for the options.";
-
 PyModuleDef moduleDefinition = {
     PyModuleDef_HEAD_INIT,
     "Dexmor", // m_name
-    moduleDoc, // m_doc
+    nullptr,  // m_doc: the module has no docstring (its stub Dexmor.pyi describes it)
     -1,       // m_size: state lives in statics
     methods,  // m_methods
     nullptr,  // m_slots

@@ -56,6 +56,11 @@ foreach(file include/dexmor/platform/FileIo.hpp include/dexmor/platform/HugePage
     message(FATAL_ERROR "a private header was installed: ${file}")
   endif()
 endforeach()
+# One version everywhere: the CMake package says the project's version too.
+file(READ ${prefix}/${LIBDIR}/cmake/Dexmor/DexmorConfigVersion.cmake package_version)
+if(NOT package_version MATCHES "set\\(PACKAGE_VERSION \"${VERSION}\"\\)")
+  message(FATAL_ERROR "the CMake package does not say version ${VERSION}")
+endif()
 file(READ ${prefix}/share/man/man1/dexmor.1 manual LIMIT 200)
 if(NOT manual MATCHES "Dexmor ${VERSION}")
   message(FATAL_ERROR "the manual page does not name version ${VERSION}")
