@@ -24,6 +24,7 @@ namespace core = OrvexKavorCore;
 
 std::string lineOf(std::string_view name, const core::Diagnosis& diagnosis) {
     std::string line = shownName(name);
+    if (diagnosis.exceededBudget) return line + ": not checked, " + overBudget(diagnosis) + "\n";
     if (diagnosis.readsAsBinary) {
         line += ": " + diagnosis.description + "\n";
         for (const std::string& warning : diagnosis.warnings) line += shownName(name) + ": warning: " + warning + "\n";
@@ -57,7 +58,11 @@ std::string jsonLineOf(const Source& source, const core::Diagnosis& diagnosis) {
         {"reads_as_binary", diagnosis.readsAsBinary},
         {"description", diagnosis.readsAsBinary ? nlohmann::ordered_json(diagnosis.description) : nullptr},
     };
-    if (!diagnosis.readsAsBinary) {
+    if (diagnosis.exceededBudget) {
+        line["reads_as_binary"] = nullptr;
+        line["reason"] = overBudget(diagnosis);
+        line["exceeded_budget"] = *diagnosis.exceededBudget;
+    } else if (!diagnosis.readsAsBinary) {
         line["reason"] = diagnosis.opened && diagnosis.failure ? diagnosis.failure->reason : diagnosis.reason();
         line["offset"] = diagnosis.opened && diagnosis.failure ? nlohmann::ordered_json(diagnosis.failure->offset) : nullptr;
         line["record_path"] = diagnosis.failure ? partsOf(diagnosis.failure->recordPath) : std::vector<std::string>{};

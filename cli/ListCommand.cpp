@@ -23,6 +23,7 @@ namespace core = OrvexKavorCore;
 
 std::string textOf(const Source& source, const core::Diagnosis& diagnosis) {
     std::string text = shownName(source.name) + ": ";
+    if (diagnosis.exceededBudget) return text + "not listed, " + overBudget(diagnosis) + "\n";
     if (!diagnosis.readsAsBinary) return text + "not readable as binary: " + diagnosis.reason() + "\n";
     text += diagnosis.description + "\n";
     for (std::size_t i = 0; i < diagnosis.materials.size(); ++i) {
@@ -40,7 +41,10 @@ std::string jsonOf(const Source& source, const core::Diagnosis& diagnosis) {
         {"kind", core::extensionOf(source.kind)},
         {"reads_as_binary", diagnosis.readsAsBinary},
     };
-    if (!diagnosis.readsAsBinary) {
+    if (diagnosis.exceededBudget) {
+        line["reads_as_binary"] = nullptr;
+        line["reason"] = overBudget(diagnosis);
+    } else if (!diagnosis.readsAsBinary) {
         line["reason"] = diagnosis.reason();
     } else if (source.kind == core::FileKind::MaterialLibrary) {
         line["description"] = diagnosis.description;

@@ -50,9 +50,14 @@ std::optional<ReportArgs> parseReportArgs(Args args, std::string_view command, i
 core::Diagnosis surveyOf(const Source& source) {
     core::ConversionOptions options;
     options.survey = true;
-    options.maxOutput = 0; // nothing is kept: the whole document is looked at
+    // Nothing is kept, but the document is still made: the output budget bounds the
+    // time a hostile file can take.
     Nowhere nowhere;
     return core::convert(source.kind, source.input(), nowhere, options);
+}
+
+std::string overBudget(const core::Diagnosis& diagnosis) {
+    return "its XML would exceed " + std::to_string(diagnosis.exceededBudget.value_or(0)) + " bytes (the output budget)";
 }
 
 } // namespace dexmor

@@ -7,6 +7,7 @@
 #include <dexmor/dexmor.hpp>
 
 #include <optional>
+#include <string>
 #include <string_view>
 #include <vector>
 
@@ -24,7 +25,11 @@ struct ReportArgs {
 std::optional<ReportArgs> parseReportArgs(Args args, std::string_view command, int& exitStatus);
 
 // Converts `source` without keeping the document, for what the conversion
-// finds: the diagnosis with the survey of the document.
+// finds: the diagnosis with the survey of the document. A document over the
+// output budget stops the survey (Diagnosis::exceededBudget).
 OrvexKavorCore::Diagnosis surveyOf(const Source& source);
+
+// "its XML would exceed N bytes (the output budget)", for a survey stopped there.
+std::string overBudget(const OrvexKavorCore::Diagnosis& diagnosis);
 
 } // namespace dexmor

@@ -56,6 +56,14 @@ def test_output_budget_stops_the_tool_with_bounded_memory(amplifier, tmp_path):
     assert (run.returncode, run.stdout.decode()) == (0, Dexmor.getZelmatXml(str(SAMPLE)))
 
 
+def test_output_budget_bounds_the_reports_too(amplifier):
+    # check and list make the document to survey it: the budget bounds their time.
+    for command, done in (("check", "checked"), ("list", "listed")):
+        run = dexmor(command, amplifier)
+        assert run.returncode == 1
+        assert run.stdout.decode() == f"{amplifier}: not {done}, its XML would exceed 268435456 bytes (the output budget)\n"
+
+
 def test_output_budget_raises_in_the_module(amplifier):
     with pytest.raises(Dexmor.error, match=r"amplifier.zelmat: the XML would exceed 268435456 bytes"):
         Dexmor.getZelmatXml(str(amplifier))
