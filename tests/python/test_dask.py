@@ -6,7 +6,6 @@ and one conversion in an output folder where others have planted links."""
 import builtins
 import collections
 import errno
-import importlib.util
 import logging
 import os
 import pathlib
@@ -14,6 +13,7 @@ import shutil
 import stat
 import subprocess
 import sys
+import types
 
 import pytest
 
@@ -107,9 +107,10 @@ def test_converts_a_folder_on_two_worker_processes(tmp_path, mode):
 
 
 def load_script():
-    spec = importlib.util.spec_from_file_location("convert_on_dask", SCRIPT)
-    script = importlib.util.module_from_spec(spec)
-    spec.loader.exec_module(script)
+    # The example as a module of its own, without running its command line.
+    script = types.ModuleType("convert_on_dask")
+    script.__file__ = str(SCRIPT)
+    exec(compile(SCRIPT.read_text(encoding="utf-8"), str(SCRIPT), "exec"), script.__dict__)
     return script
 
 

@@ -2,7 +2,6 @@
 with its documentation; the copies beside the built module and as the stub
 package Dexmor-stubs are current; and type checkers find and apply it."""
 import ast
-import importlib.util
 import os
 import pathlib
 import subprocess
@@ -80,8 +79,8 @@ def run_mypy(tmp_path, program):
                            str(source)], capture_output=True, text=True, timeout=300, cwd=tmp_path)
 
 
-@pytest.mark.skipif(importlib.util.find_spec("mypy") is None, reason="mypy is not installed")
 def test_mypy_finds_the_stub_package_and_checks_callers(tmp_path):
+    pytest.importorskip("mypy")
     run = run_mypy(tmp_path, TYPED_PROGRAM)
     assert run.returncode == 0, run.stdout + run.stderr
     run = run_mypy(tmp_path, "import Dexmor\nx: int = Dexmor.convert(b'lib.zelmat')\n")
@@ -89,8 +88,8 @@ def test_mypy_finds_the_stub_package_and_checks_callers(tmp_path):
     assert "incompatible type" in run.stdout and "Incompatible types in assignment" in run.stdout
 
 
-@pytest.mark.skipif(importlib.util.find_spec("mypy") is None, reason="mypy is not installed")
 def test_stubtest_finds_the_stub_true_to_the_module():
+    pytest.importorskip("mypy")
     run = subprocess.run([sys.executable, "-m", "mypy.stubtest", "Dexmor"], capture_output=True, text=True,
                          timeout=300)
     assert run.returncode == 0, run.stdout + run.stderr
