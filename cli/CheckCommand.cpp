@@ -39,18 +39,6 @@ std::string lineOf(std::string_view name, const core::Diagnosis& diagnosis) {
     return line + "\n";
 }
 
-// The record path "a / b / c" as its parts.
-std::vector<std::string> partsOf(const std::string& path) {
-    std::vector<std::string> parts;
-    for (std::size_t start = 0; !path.empty() && start <= path.size();) {
-        const auto end = path.find(" / ", start);
-        parts.push_back(path.substr(start, end == std::string::npos ? std::string::npos : end - start));
-        if (end == std::string::npos) break;
-        start = end + 3;
-    }
-    return parts;
-}
-
 std::string jsonLineOf(const Source& source, const core::Diagnosis& diagnosis) {
     nlohmann::ordered_json line = {
         {"path", source.name},
@@ -65,7 +53,7 @@ std::string jsonLineOf(const Source& source, const core::Diagnosis& diagnosis) {
     } else if (!diagnosis.readsAsBinary) {
         line["reason"] = diagnosis.opened && diagnosis.failure ? diagnosis.failure->reason : diagnosis.reason();
         line["offset"] = diagnosis.opened && diagnosis.failure ? nlohmann::ordered_json(diagnosis.failure->offset) : nullptr;
-        line["record_path"] = diagnosis.failure ? partsOf(diagnosis.failure->recordPath) : std::vector<std::string>{};
+        line["record_path"] = diagnosis.failure ? diagnosis.failure->recordPath : std::vector<std::string>{};
         line["fallback_bytes"] = diagnosis.fallbackLength;
     }
     line["warnings"] = diagnosis.warnings;

@@ -401,11 +401,9 @@ void raiseReadError(const core::Diagnosis& result, PyObject* path) {
     const Ref offset(PyLong_FromUnsignedLongLong(failure.offset));
     const Ref records(PyList_New(0));
     if (!why || !reason || !offset || !records) return;
-    for (std::string_view rest = failure.recordPath; !rest.empty();) {
-        const std::size_t separator = rest.find(" / ");
-        const Ref record(lenientText(rest.substr(0, separator)));
+    for (const std::string& level : failure.recordPath) {
+        const Ref record(lenientText(level));
         if (!record || PyList_Append(records.get(), record.get()) < 0) return;
-        rest = separator == std::string_view::npos ? std::string_view() : rest.substr(separator + 3);
     }
     const Ref message(path ? PyUnicode_FromFormat("%U: not readable as binary: %U", path, why.get())
                            : PyUnicode_FromFormat("not readable as binary: %U", why.get()));

@@ -23,8 +23,17 @@ boost::shared_ptr<QuickArchive::Chunk> newChunk() {
 
 } // namespace
 
+std::string ReadFailure::recordPathText() const {
+    std::string text;
+    for (const std::string& level : recordPath) {
+        if (!text.empty()) text += " / ";
+        text += level;
+    }
+    return text;
+}
+
 std::string ReadFailure::describe() const {
-    std::string text = recordPath.empty() ? reason : recordPath + ": " + reason;
+    std::string text = recordPath.empty() ? reason : recordPathText() + ": " + reason;
     text += " at offset " + std::to_string(offset);
     return text;
 }
@@ -305,21 +314,74 @@ bool QuickArchive::loadFromFile(const std::filesystem::path& path) {
     return load(in);
 }
 
-std::string QuickArchive::recordPath() const {
-    // "what index name" per level, the words present joined by single spaces.
-    std::string path;
-    for (const Frame& frame : frames_) {
-        if (!path.empty()) path += " / ";
-        const std::size_t levelStart = path.size();
-        const auto word = [&](std::string_view text) {
-            if (path.size() > levelStart) path += ' ';
-            path += text;
-        };
+namespace {
+
+// A name as a record path shows it: quoted, with quotes, backslashes and control
+// characters escaped, and cut after 60 bytes (at a character boundary) so that a
+// hostile name of megabytes cannot swamp a report.
+std::string quotedName(std::string_view name) {
+    constexpr std::size_t kShownBytes = 60;
+    std::string quoted = "\"";
+    std::size_t shown = name.size();
+    if (shown > kShownBytes) {
+        shown = kShownBytes;
+        while (shown > 0 && (static_cast<unsigned char>(name[shown]) & 0xC0) == 0x80) --shown;
+    }
+    for (const char c : name.substr(0, shown)) {
+        const auto byte = static_cast<unsigned char>(c);
+        if (c == '"' || c == '\\') {
+            quoted += '\\';
+            quoted += c;
+        } else if (byte < 0x20 || byte == 0x7F) {
+            constexpr char kHex[] = "0123456789abcdef";
+            quoted += "\\x";
+            quoted += kHex[byte >> 4];
+            quoted += kHex[byte & 0xF];
+        } else {
+            quoted += c;
+        }
+    }
+    if (shown < name.size()) quoted += "...";
+    quoted += '"';
+    return quoted;
+}
+
+} // namespace
+
+std::vector<std::string> QuickArchive::recordPath() const {
+    // One level per frame, "what index "name"", the words present joined by single
+    // spaces. A field's label directly above the member it holds reads as one
+    // level: `texture "color_tex"` for the label "color_tex" and the texture inside
+    // it; above an indexed or named member ("BRDF layer 2") the index says enough.
+    std::vector<std::string> levels;
+    std::string level;
+    const auto word = [&level](std::string_view text) {
+        if (!level.empty()) level += ' ';
+        level += text;
+    };
+    const char* heldLabel = nullptr;
+    for (std::size_t i = 0; i < frames_.size(); ++i) {
+        const Frame& frame = frames_[i];
+        const bool isLabel = !frame.what && frame.index < 0;
+        if (isLabel && i + 1 < frames_.size()) {
+            const Frame& member = frames_[i + 1];
+            const bool memberNamed = member.name || member.liveName.isRead();
+            if (member.what && member.index < 0 && !memberNamed) {
+                heldLabel = frame.name;
+                continue;
+            }
+            if (member.what && member.index >= 0) continue;
+        }
+        level.clear();
         if (frame.what) word(frame.what);
         if (frame.index >= 0) word(std::to_string(frame.index));
-        if (frame.name) word(frame.name);
+        const char* name = frame.name ? frame.name : heldLabel;
+        if (name) word(frame.what ? quotedName(name) : name);
+        if (frame.liveName.isRead()) word(quotedName(*frame.liveName.name));
+        heldLabel = nullptr;
+        levels.push_back(level);
     }
-    return path;
+    return levels;
 }
 
 bool QuickArchive::checkVersion(VersionWord version, std::uint16_t latest, std::string_view what) {

@@ -14,12 +14,12 @@ using record::since;
 constexpr std::array kFields = {
     field<&B::color>("color"),
     field<&B::transparency>("transparency"),
-    field<&B::colorTexMult>("colorTexMult"),
-    field<&B::transparencyTexMult>("transparencyTexMult"),
+    field<&B::colorTexMult>("color_tex_mult"),
+    field<&B::transparencyTexMult>("transparency_tex_mult"),
     brdf::pathItem<&B::colorTex>("colorTex path", between(1, 1)),
     brdf::pathItem<&B::transparencyTex>("transparencyTex path", between(1, 1)),
-    field<&B::colorTex>("colorTex", since(2)),
-    field<&B::transparencyTex>("transparencyTex", since(2)),
+    field<&B::colorTex>("color_tex", since(2)),
+    field<&B::transparencyTex>("transparency_tex", since(2)),
     kind::baseRecord<B>(since(3)),
 };
 

@@ -120,7 +120,7 @@ Diagnosis unopened(FileError why) {
 
 Diagnosis tooLargeForAnArchive() {
     Diagnosis result;
-    result.failure = ReadFailure{"the file is larger than the 4 GiB an archive can hold", 0, "header"};
+    result.failure = ReadFailure{"the file is larger than the 4 GiB an archive can hold", 0, {"header"}};
     return result;
 }
 

@@ -36,7 +36,7 @@ std::optional<ZelMatFile::Framing> ZelMatFile::readFraming(const SharedBytes& sh
     const std::string_view bytes = shared.view();
     const auto reject = [&](std::string reason, std::uint64_t offset,
                             std::string recordPath = "header") -> std::optional<Framing> {
-        if (failure) *failure = ReadFailure{std::move(reason), offset, std::move(recordPath)};
+        if (failure) *failure = ReadFailure{std::move(reason), offset, {std::move(recordPath)}};
         return std::nullopt;
     };
     if (bytes.size() < kHeaderSize) return reject("the file is shorter than its 8-byte header", 0);
@@ -113,7 +113,7 @@ bool ZelMatFile::readMaterials(Framing& framing, const std::function<void(Materi
     // A material record takes at least a kind id and a version word.
     if (!ar.canHold(framing.count, 8)) {
         failure = ReadFailure{"a count of " + std::to_string(framing.count) + " materials cannot fit in the file", 4,
-                              "header"};
+                              {"header"}};
         return false;
     }
     for (std::uint32_t i = 0; i < framing.count; ++i) {

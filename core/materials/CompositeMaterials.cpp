@@ -25,13 +25,13 @@ constexpr std::array kMultiFields = {
 constexpr std::array k2SidedFields = {
     field<&Material2Sided::front>("front"),
     field<&Material2Sided::back>("back"),
-    field<&Material2Sided::translucencyTex>("translucencyTex"),
+    field<&Material2Sided::translucencyTex>("translucency_tex"),
     field<&Material2Sided::translucency>("translucency"),
-    field<&Material2Sided::translucencyTexMult>("translucencyTexMult"),
-    field<&Material2Sided::force1Sided>("force1Sided"),
-    field<&Material2Sided::transparencyTex>("transparencyTex", since(2)),
+    field<&Material2Sided::translucencyTexMult>("translucency_tex_mult"),
+    field<&Material2Sided::force1Sided>("force_1sided"),
+    field<&Material2Sided::transparencyTex>("transparency_tex", since(2)),
     field<&Material2Sided::transparency>("transparency", since(2)),
-    field<&Material2Sided::transparencyTexMult>("transparencyTexMult", since(2)),
+    field<&Material2Sided::transparencyTexMult>("transparency_tex_mult", since(2)),
     baseRecord<Material2Sided>(since(3)),
 };
 
@@ -51,7 +51,7 @@ constexpr std::array kSkp2SidedFields = {
     baseRecord<MaterialSkp2Sided>(),
     field<&MaterialSkp2Sided::front>("front"),
     field<&MaterialSkp2Sided::back>("back"),
-    field<&MaterialSkp2Sided::force1Sided>("force1Sided"),
+    field<&MaterialSkp2Sided::force1Sided>("force_1sided"),
 };
 
 constexpr std::array kSkp2SidedParameters = {
@@ -62,10 +62,10 @@ constexpr std::array kSkp2SidedParameters = {
 
 constexpr std::array kAngleBlendFields = {
     baseRecord<MaterialAngleBlend>(),
-    field<&MaterialAngleBlend::mtlOne>("mtlOne"),
-    field<&MaterialAngleBlend::mtlTwo>("mtlTwo"),
-    field<&MaterialAngleBlend::startAngle>("startAngle"),
-    field<&MaterialAngleBlend::stopAngle>("stopAngle"),
+    field<&MaterialAngleBlend::mtlOne>("mtl_one"),
+    field<&MaterialAngleBlend::mtlTwo>("mtl_two"),
+    field<&MaterialAngleBlend::startAngle>("start_angle"),
+    field<&MaterialAngleBlend::stopAngle>("stop_angle"),
 };
 
 constexpr std::array kAngleBlendParameters = {

@@ -20,9 +20,9 @@ using record::since;
 // --- bump: the current record (older ones are read by hand) ---
 
 constexpr std::array kBumpFields = {
-    field<&MaterialBump::bumpTexMult>("bumpTexMult"),
-    field<&MaterialBump::bumpTex>("bumpTex"),
-    record::fieldAs<material::Required<MaterialPtr>, &MaterialBump::baseMtl>("baseMtl"),
+    field<&MaterialBump::bumpTexMult>("bump_tex_mult"),
+    field<&MaterialBump::bumpTex>("bump_tex"),
+    record::fieldAs<material::Required<MaterialPtr>, &MaterialBump::baseMtl>("base_mtl"),
     baseRecord<MaterialBump>(),
 };
 
@@ -34,44 +34,44 @@ constexpr std::array kBumpParameters = {
 
 constexpr std::array kDisplacedFields = {
     baseRecord<MaterialDisplaced>(),
-    field<&MaterialDisplaced::baseMtl>("baseMtl"),
-    field<&MaterialDisplaced::displaceTex>("displaceTex"),
-    field<&MaterialDisplaced::displaceTexMult>("displaceTexMult"),
-    field<&MaterialDisplaced::displaceShift>("displaceShift", since(2)),
-    field<&MaterialDisplaced::displaceEdgeLength>("displaceEdgeLength", since(2)),
-    field<&MaterialDisplaced::displaceMaxSubdivs>("displaceMaxSubdivs", since(2)),
-    field<&MaterialDisplaced::displaceContinuity>("displaceContinuity", since(2)),
-    field<&MaterialDisplaced::displaceViewDependent>("displaceViewDependent", since(2)),
-    field<&MaterialDisplaced::displaceUseGlobals>("displaceUseGlobals", since(2)),
+    field<&MaterialDisplaced::baseMtl>("base_mtl"),
+    field<&MaterialDisplaced::displaceTex>("displace_tex"),
+    field<&MaterialDisplaced::displaceTexMult>("displace_tex_mult"),
+    field<&MaterialDisplaced::displaceShift>("displace_shift", since(2)),
+    field<&MaterialDisplaced::displaceEdgeLength>("displace_edge_length", since(2)),
+    field<&MaterialDisplaced::displaceMaxSubdivs>("displace_max_subdivs", since(2)),
+    field<&MaterialDisplaced::displaceContinuity>("displace_continuity", since(2)),
+    field<&MaterialDisplaced::displaceViewDependent>("displace_view_dependent", since(2)),
+    field<&MaterialDisplaced::displaceUseGlobals>("displace_use_globals", since(2)),
 };
 
 constexpr std::array kOverrideFields = {
     baseRecord<MaterialOverrideEnvironment>(),
-    field<&MaterialOverrideEnvironment::baseMtl>("baseMtl"),
-    field<&MaterialOverrideEnvironment::bgTex>("bgTex"),
-    field<&MaterialOverrideEnvironment::giTex>("giTex"),
-    field<&MaterialOverrideEnvironment::reflectTex>("reflectTex"),
-    field<&MaterialOverrideEnvironment::refractTex>("refractTex"),
-    field<&MaterialOverrideEnvironment::bgColor>("bgColor"),
-    field<&MaterialOverrideEnvironment::giColor>("giColor"),
-    field<&MaterialOverrideEnvironment::reflectColor>("reflectColor"),
-    field<&MaterialOverrideEnvironment::refractColor>("refractColor"),
-    field<&MaterialOverrideEnvironment::bgTexMult>("bgTexMult"),
-    field<&MaterialOverrideEnvironment::giTexMult>("giTexMult"),
-    field<&MaterialOverrideEnvironment::reflectTexMult>("reflectTexMult"),
-    field<&MaterialOverrideEnvironment::refractTexMult>("refractTexMult"),
-    field<&MaterialOverrideEnvironment::overrideBg>("overrideBg"),
-    field<&MaterialOverrideEnvironment::overrideGi>("overrideGi"),
-    field<&MaterialOverrideEnvironment::overrideReflect>("overrideReflect"),
-    field<&MaterialOverrideEnvironment::overrideRefract>("overrideRefract"),
+    field<&MaterialOverrideEnvironment::baseMtl>("base_mtl"),
+    field<&MaterialOverrideEnvironment::bgTex>("bg_tex"),
+    field<&MaterialOverrideEnvironment::giTex>("gi_tex"),
+    field<&MaterialOverrideEnvironment::reflectTex>("reflect_tex"),
+    field<&MaterialOverrideEnvironment::refractTex>("refract_tex"),
+    field<&MaterialOverrideEnvironment::bgColor>("bg_color"),
+    field<&MaterialOverrideEnvironment::giColor>("gi_color"),
+    field<&MaterialOverrideEnvironment::reflectColor>("reflect_color"),
+    field<&MaterialOverrideEnvironment::refractColor>("refract_color"),
+    field<&MaterialOverrideEnvironment::bgTexMult>("bg_tex_mult"),
+    field<&MaterialOverrideEnvironment::giTexMult>("gi_tex_mult"),
+    field<&MaterialOverrideEnvironment::reflectTexMult>("reflect_tex_mult"),
+    field<&MaterialOverrideEnvironment::refractTexMult>("refract_tex_mult"),
+    field<&MaterialOverrideEnvironment::overrideBg>("override_bg"),
+    field<&MaterialOverrideEnvironment::overrideGi>("override_gi"),
+    field<&MaterialOverrideEnvironment::overrideReflect>("override_reflect"),
+    field<&MaterialOverrideEnvironment::overrideRefract>("override_refract"),
 };
 
 constexpr std::array kExclusionFields = {
     field<&MaterialObjectExclusion::mode>("mode"),
-    field<&MaterialObjectExclusion::baseMtl>("baseMtl"),
+    field<&MaterialObjectExclusion::baseMtl>("base_mtl"),
     field<&MaterialObjectExclusion::objects>("objects"),
     baseRecord<MaterialObjectExclusion>(since(2)),
-    field<&MaterialObjectExclusion::shortCircuit>("shortCircuit", since(3)),
+    field<&MaterialObjectExclusion::shortCircuit>("short_circuit", since(3)),
 };
 
 constexpr std::array kExclusionParameters = {
@@ -90,9 +90,9 @@ constexpr std::array kExclusionParameters = {
 
 constexpr std::array kAlphaFields = {
     baseRecord<MaterialAlphaContribution>(),
-    field<&MaterialAlphaContribution::baseMtl>("baseMtl"),
-    field<&MaterialAlphaContribution::alphaTex>("alphaTex"),
-    field<&MaterialAlphaContribution::alphaTexMult>("alphaTexMult"),
+    field<&MaterialAlphaContribution::baseMtl>("base_mtl"),
+    field<&MaterialAlphaContribution::alphaTex>("alpha_tex"),
+    field<&MaterialAlphaContribution::alphaTexMult>("alpha_tex_mult"),
     field<&MaterialAlphaContribution::alpha>("alpha"),
 };
 
@@ -104,28 +104,28 @@ constexpr std::array kAlphaParameters = {
 };
 
 constexpr std::array kToonFields = {
-    field<&MaterialToon::baseMtl>("baseMtl"),
-    field<&MaterialToon::lineWidth>("lineWidth"),
-    field<&MaterialToon::lineWidthTexMult>("lineWidthTexMult"),
-    field<&MaterialToon::lineWidthTex>("lineWidthTex"),
+    field<&MaterialToon::baseMtl>("base_mtl"),
+    field<&MaterialToon::lineWidth>("width"),
+    field<&MaterialToon::lineWidthTexMult>("width_tex_mult"),
+    field<&MaterialToon::lineWidthTex>("width_tex"),
     field<&MaterialToon::opacity>("opacity"),
-    field<&MaterialToon::opacityTexMult>("opacityTexMult"),
-    field<&MaterialToon::opacityTex>("opacityTex"),
+    field<&MaterialToon::opacityTexMult>("opacity_tex_mult"),
+    field<&MaterialToon::opacityTex>("opacity_tex"),
     field<&MaterialToon::distort>("distort"),
-    field<&MaterialToon::distortTexMult>("distortTexMult"),
-    field<&MaterialToon::distortTex>("distortTex"),
-    field<&MaterialToon::lineColor>("lineColor"),
-    field<&MaterialToon::lineColorTexMult>("lineColorTexMult"),
-    field<&MaterialToon::lineColorTex>("lineColorTex"),
-    field<&MaterialToon::zThreshold>("zThreshold"),
-    field<&MaterialToon::traceBias>("traceBias"),
-    field<&MaterialToon::normalThreshold>("normalThreshold"),
-    field<&MaterialToon::lineUnits>("lineUnits"),
-    field<&MaterialToon::doSecondary>("doSecondary"),
-    field<&MaterialToon::divideByDist>("divideByDist"),
+    field<&MaterialToon::distortTexMult>("distort_tex_mult"),
+    field<&MaterialToon::distortTex>("distort_tex"),
+    field<&MaterialToon::lineColor>("color"),
+    field<&MaterialToon::lineColorTexMult>("color_tex_mult"),
+    field<&MaterialToon::lineColorTex>("color_tex"),
+    field<&MaterialToon::zThreshold>("z_threshold"),
+    field<&MaterialToon::traceBias>("trace_bias"),
+    field<&MaterialToon::normalThreshold>("normal_threshold"),
+    field<&MaterialToon::lineUnits>("line_units"),
+    field<&MaterialToon::doSecondary>("do_secondary"),
+    field<&MaterialToon::divideByDist>("divide_by_distance"),
     baseRecord<MaterialToon>(),
-    field<&MaterialToon::doSilhouetteMult>("doSilhouetteMult", since(2)),
-    field<&MaterialToon::silhouetteMult>("silhouetteMult", since(2)),
+    field<&MaterialToon::doSilhouetteMult>("do_silhouette_mult", since(2)),
+    field<&MaterialToon::silhouetteMult>("silhouette_mult", since(2)),
 };
 
 // The unfolded asset; the folded one (MaterialAssets.cpp) names the same
@@ -167,17 +167,17 @@ bool MaterialBump::readVersion(QuickArchive& ar, unsigned version) {
         if (!readNameItem(ar)) return false;
         std::string path;
         {
-            auto label = QuickArchive::Scope::label(ar, "bumpTex");
+            auto label = QuickArchive::Scope::label(ar, "bump_tex");
             if (!ar.readWString(path)) return false;
         }
         bumpTex = makeBitmapTexture(path);
         ar.read(bumpTexMult);
-        return readMember(ar, baseMtl, "baseMtl");
+        return readMember(ar, baseMtl, "base_mtl");
     }
     if (version == 2) {
         if (!ar.readWString(name)) return false;
         ar.read(bumpTexMult);
-        return readOptionalMember(ar, bumpTex, "bumpTex") && readMember(ar, baseMtl, "baseMtl");
+        return readOptionalMember(ar, bumpTex, "bump_tex") && readMember(ar, baseMtl, "base_mtl");
     }
     return record::readFields(ar, *this, fields(), version);
 }

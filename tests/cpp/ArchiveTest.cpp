@@ -144,7 +144,7 @@ TEST(Archive, FailuresKeepTheFirstReasonAndTheRecordPath) {
     }
     ASSERT_TRUE(ar.failed());
     EXPECT_EQ(ar.failure()->describe(),
-              "material 3 / BRDF layer 2 / texture color_tex: unknown texture kind 41 at offset 10");
+              "material 3 / BRDF layer 2 / texture \"color_tex\": unknown texture kind 41 at offset 10");
 }
 
 TEST(Archive, NestingIsLimited) {
@@ -214,5 +214,5 @@ TEST(RecordTable, AFailingFieldNamesItselfInTheFailure) {
     Block back;
     EXPECT_FALSE(record::readFields(ar, back, kBlockFields, 2));
     ASSERT_TRUE(ar.failed());
-    EXPECT_EQ(ar.failure()->recordPath, "file");
+    EXPECT_EQ(ar.failure()->recordPathText(), "file");
 }

@@ -253,7 +253,7 @@ TEST(BRDFRecord, RefusedRecordsSayWhy) {
     Diffuse_BRDF layer;
     expectReadFails(layer, Image{}.version(0, 4).append(diffuse).bytes, "unknown diffuse BRDF version (0, 4)");
     expectReadFails(layer, Image{}.version(0, 3).append(diffuse).flag(true).i32(41).bytes,
-                    "colorTex / texture: unknown texture kind 41");
+                    R"(texture "color_tex": unknown texture kind 41)");
     expectReadFails(layer, Image{}.version(0, 3).append(diffuse).flag(false).flag(false).version(0, 5).bytes,
                     "base record: unknown BRDF base record version (0, 5)");
 }

@@ -91,7 +91,7 @@ TEST(MaterialFile, UnusableHeadersAreRejectedWithAReason) {
     for (const std::string& bad : {header(3, 1, 1), header(4, 1), header(0, 1), std::string("\x00\x00\x03")})
         EXPECT_FALSE(ZelMatFile::readFraming(bad, &why)); // the first half not 0, unknown generations, cut short
     EXPECT_FALSE(ZelMatFile::readFraming(header(3, 1) + std::string("\x01\x00\x00\x00", 4) + "short", &why));
-    EXPECT_EQ(why.recordPath, "archive image");
+    EXPECT_EQ(why.recordPathText(), "archive image");
 }
 
 TEST(MaterialFile, AFailedReadKeepsTheListAndSaysWhy) {

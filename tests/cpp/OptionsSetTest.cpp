@@ -206,7 +206,7 @@ TEST(AllOptions, RejectedRecordsSayWhy) {
         {VersionWord::make(1, 23), "camera", [](QuickArchive& ar) { ar.write(VersionWord::make(0, 3)); },
          "camera: unknown physical camera version (0, 3)"},
         {VersionWord::make(1, 23), "bg_tex", [](QuickArchive& ar) { ar.write(true), ar.write(std::int32_t{41}); },
-         "bg_tex / texture: unknown texture kind 41"},
+         R"(texture "bg_tex": unknown texture kind 41)"},
     };
     for (const auto& [word, stopAt, append, failure] : cases) {
         QuickArchive ar = assemble(source, 23, word, stopAt);

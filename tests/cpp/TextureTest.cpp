@@ -289,13 +289,13 @@ TEST(Texture, MandatoryMembersMustBeSetToWrite) {
 TEST(Texture, UnknownMembersFailTheOwnerWithTheirPlace) {
     CheckerTexture checker; // its white colour names texture kind 13
     expectReadFails(checker, Image{}.version(0, 2).i32(BaseUVW::kPlanarWorld).append(planarWorldRecord()).i32(13).bytes,
-                    "texture white_color: unknown texture kind 13");
+                    R"(texture "white_color": unknown texture kind 13)");
     InvertTexture invert; // its mandatory texture is the stored "no texture"
-    expectReadFails(invert, Image{}.version(0, 1).i32(-1).bytes, "texture texture: unknown texture kind -1");
+    expectReadFails(invert, Image{}.version(0, 1).i32(-1).bytes, R"(texture "texture": unknown texture kind -1)");
     FresnelTexture fresnel; // a present optional texture of kind -1
     const Image fresnelHead = Image{}.version(0, 2).f32({1, 1, 1, 0, 0, 0, 1, 1, 1, 1, 1, 1});
     expectReadFails(fresnel, Image(fresnelHead).flag(false).flag(true).i32(-1).bytes,
-                    "texture white_color_tex: unknown texture kind -1");
+                    R"(texture "white_color_tex": unknown texture kind -1)");
 }
 
 // --- deep trees (a stored tree nested too deep: HostileInputTest) ---

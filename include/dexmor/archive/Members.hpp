@@ -22,7 +22,8 @@ struct Family;
 
 // Reads a mandatory member: its kind id, a new object of that kind put into
 // `member`, then the object's record. `name` and `index` label the member in
-// failure reports ("texture color_tex", "BRDF layer 2").
+// failure reports (`texture "color_tex"`, "BRDF layer 2"); an object with a name
+// of its own (a material, a BRDF layer) shows it as far as it has been read.
 template <class Base>
 bool readMember(QuickArchive& ar, boost::shared_ptr<Base>& member, const char* name = nullptr,
                 std::int64_t index = -1) {
@@ -32,7 +33,14 @@ bool readMember(QuickArchive& ar, boost::shared_ptr<Base>& member, const char* n
     boost::shared_ptr<Base> object = Family<Base>::create(kind);
     if (!object) return ar.fail(std::string("unknown ") + Family<Base>::word + " kind " + std::to_string(kind));
     member = object;
-    return object->readFromArchive(ar);
+    if constexpr (requires { object->name; }) {
+        // A new object holds its kind's default name until its record's name is read.
+        const std::string defaultName = object->name;
+        scope.showName(object->name, defaultName);
+        return object->readFromArchive(ar);
+    } else {
+        return object->readFromArchive(ar);
+    }
 }
 
 // Reads an optional member: Bool present, then (when present) as readMember.

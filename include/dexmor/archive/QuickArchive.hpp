@@ -203,12 +203,19 @@ public:
         Scope(const Scope&) = delete;
         Scope& operator=(const Scope&) = delete;
         explicit operator bool() const { return ok_; }
+        // Shows `name` on this level of the record path as it reads at the time of a
+        // failure (a material's name is read after its scope opens), unless it still
+        // equals `unread`, the value it had before its record was read. Both must
+        // outlive the scope.
+        void showName(const std::string& name, const std::string& unread) {
+            if (pushed_) ar_.frames_.back().liveName = LiveName{&name, &unread};
+        }
 
     private:
         Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index, bool nests)
             : ar_(ar), nests_(nests), pushed_(ar.frames_.size() < kMaxNesting), ok_(true) {
             // The path is kept only up to the limit: deeper frames add nothing a user needs.
-            if (pushed_) ar_.frames_.push_back(Frame{what, name, index});
+            if (pushed_) ar_.frames_.push_back(Frame{what, name, index, {}});
             if (nests_ && ++ar_.nesting_ > kMaxNesting) tooDeep();
         }
         void tooDeep();
@@ -219,15 +226,21 @@ public:
     };
 
 private:
+    struct LiveName {
+        const std::string* name = nullptr;
+        const std::string* unread = nullptr;
+        bool isRead() const { return name && *name != *unread; }
+    };
     struct Frame {
         const char* what;
         const char* name;
         std::int64_t index;
+        LiveName liveName;
     };
 
     Chunk& chunkFor(std::uint64_t position);
     bool getRawAcrossChunks(void* data, std::size_t length);
-    std::string recordPath() const;
+    std::vector<std::string> recordPath() const;
 
     std::vector<boost::shared_ptr<Chunk>> chunks_;
     std::uint64_t readPos_ = 0;
