@@ -211,9 +211,24 @@ int main(int argc, char** argv) {
             << generation2({hostile::amplifier(std::stoul(argv[2]), std::stoul(argv[3]), cheapestLayer)});
         return 0;
     }
+    if (argc >= 4 && std::string_view(argv[1]) == "--names") {
+        // make_seeds --names FILE NAME...: one material of 20 layers per name (as
+        // UTF-8), so that each name stands in 20 urls: documents of any width of
+        // character, to test what takes the text.
+        const ConversionContext context;
+        std::vector<MaterialPtr> materials;
+        for (int i = 3; i < argc; ++i) {
+            MaterialPtr material = hostile::amplifier(0, 20, cheapestLayer);
+            material->name = argv[i];
+            materials.push_back(material);
+        }
+        std::ofstream(argv[2], std::ios::binary) << generation2(materials);
+        return 0;
+    }
     if (argc != 3) {
         std::fprintf(stderr, "usage: make_seeds SAMPLE_DIR OUTPUT_DIR\n"
-                             "       make_seeds --amplifier NAME_LENGTH LAYERS FILE\n");
+                             "       make_seeds --amplifier NAME_LENGTH LAYERS FILE\n"
+                             "       make_seeds --names FILE NAME...\n");
         return 2;
     }
     const fs::path samples = argv[1];

@@ -34,11 +34,14 @@ text.
 """
 
 import os
-from typing import List, Literal, Optional, Tuple, Union
+from typing import List, Literal, Optional, Protocol, Tuple, Union, overload
 
 _Path = Union[str, "os.PathLike[str]"]
 _Data = Union[bytes, bytearray, memoryview]
 _Kind = Literal["zelmat", "zelopt"]
+
+class _BinaryWriter(Protocol):
+    def write(self, data: bytes, /) -> object: ...
 
 __version__: str
 
@@ -64,8 +67,9 @@ class ReadError(error):
     """The offset in the file just after the wrong value."""
     record_path: List[str]
     """The records from the top of the file down to the one that failed, as
-    ["material 4", "layers", "BRDF layer 0"]; empty when the file failed before
-    its first record."""
+    ['material 4', 'BRDF layer 0', 'texture "color_tex"'] (fields named as the
+    XML names them; a material or layer whose name was read shows it, quoted);
+    empty when the file failed before its first record."""
 
 def getZelmatXml(path: _Path, /) -> str:
     """Gets the xml from a zelmat file.
@@ -101,14 +105,15 @@ def diagnose(path: _Path, /) -> Optional[str]:
     the reason as one line: that the file cannot be opened, or where its
     records stopped reading (the path of records from the top of the file,
     what was wrong there and the offset in the file just after it), as in
-    'material 4 / layers / BRDF layer 0: unknown BRDF layer kind 41 at offset 1667'.
+    'material 4 / BRDF layer 0: unknown BRDF layer kind 41 at offset 1667'.
     The conversion of such a file returns its own text (or "").
 
     Raises `error` when `path` ends in neither extension.
     """
 
-def convert(path: _Path, /, *, kind: Optional[_Kind] = None, strict: bool = False,
-            max_output: Optional[int] = None) -> str:
+@overload
+def convert(__path: _Path, *, kind: Optional[_Kind] = None, strict: bool = False,
+            max_output: Optional[int] = None, out: None = None) -> str:
     """Converts the file at `path` to its XML document.
 
     The file is read as `kind` ("zelmat" or "zelopt") when given, else as the kind
@@ -126,6 +131,27 @@ def convert(path: _Path, /, *, kind: Optional[_Kind] = None, strict: bool = Fals
     of 256 MiB and 1,000 times the file's size), 0 for none. A document over it
     raises `error`. Raises `error` when `path` ends in neither extension and no
     kind is given, ValueError for another kind or a negative max_output.
+
+    The str holds each character at the width its widest character needs, built
+    in place as the document is made: the call holds the document once.
+    """
+
+@overload
+def convert(__path: _Path, *, kind: Optional[_Kind] = None, strict: bool = False,
+            max_output: Optional[int] = None, out: Union[_Path, _BinaryWriter]) -> None:
+    """Converts the file at `path` and writes its XML document (UTF-8) to `out`
+    instead of returning it, holding no more than a piece of it at a time.
+
+    `out` is a path or a binary file object (anything with a write(bytes)
+    method). A path is replaced only by a whole document: the file is written
+    beside it and put in its place at the end, and on any failure (the file
+    cannot be opened, strict=True refuses it, the budget is exceeded, a write
+    fails) an earlier file there is left as it was, with nothing else left
+    behind. A file object is handed the document piece by piece; a library is
+    read through before its first byte is written, so nothing is written for one
+    that does not read as binary, but a document over its budget raises after
+    part of it was written. What write() raises is raised. Returns None;
+    otherwise raises as convert() does.
     """
 
 def convertWithDiagnosis(path: _Path, /, *, kind: Optional[_Kind] = None,

@@ -3,7 +3,7 @@
 //   Dexmor.getZelmatXml(path) -> str   XML of a material library (".zelmat")
 //   Dexmor.getZeloptXml(path) -> str   XML of a render-options file (".zelopt")
 //   Dexmor.diagnose(path) -> str|None  why a file does not read as binary, or None
-//   Dexmor.convert(path, *, kind, strict, max_output) -> str
+//   Dexmor.convert(path, *, kind, strict, max_output, out) -> str (None with out=)
 //   Dexmor.convertWithDiagnosis(path, *, kind, max_output) -> (str, str|None)
 //   Dexmor.convertBytes(data, kind, *, strict, max_output) -> str
 //   Dexmor.convertBytesWithDiagnosis(data, kind, *, max_output) -> (str, str|None)
@@ -23,12 +23,12 @@
 #include <Python.h>
 
 #include "PythonText.hpp"
+#include "Sinks.hpp"
 #include <dexmor/dexmor.hpp>
 #include <dexmor/version.hpp>
 #include <dexmor/platform/Text.hpp>
 
 #include <cerrno>
-#include <chrono>
 #include <cstring>
 #include <exception>
 #include <filesystem>
@@ -36,11 +36,9 @@
 #include <optional>
 #include <string>
 #include <string_view>
-#include <thread>
 #include <utility>
 #include <vector>
 
-#include <sys/syscall.h>
 #include <unistd.h>
 
 namespace {
@@ -108,16 +106,12 @@ void raiseModuleError(const char* message) noexcept {
     Py_DECREF(text);
 }
 
-// Thrown when a signal handler raised an exception during a call: the
-// interpreter holds that exception already.
-struct Interrupted {};
-
 // Turns a C++ exception into the matching Python exception. The interpreter
 // lock must be held.
 void raiseFromCxx(std::exception_ptr failure) noexcept {
     try {
         std::rethrow_exception(std::move(failure));
-    } catch (const Interrupted&) {
+    } catch (const python::Interrupted&) {
         // KeyboardInterrupt (or what the handler raised) is set already.
     } catch (const std::bad_alloc&) {
         PyErr_NoMemory();
@@ -260,51 +254,20 @@ bool budgetArgument(PyObject* argument, const char* function, core::ConversionOp
 
 // ---- conversion ----------------------------------------------------------------
 
-// A document in a string whose conversion stops when a signal handler raises:
-// between pieces it runs the pending handlers (Ctrl-C's KeyboardInterrupt),
-// taking the interpreter lock only for that. Handlers run on the main thread
-// only, so only a call there looks, and at most ten times a second: the lock
-// may have to wait for other threads.
-class InterruptibleText final : public core::StringSink {
-public:
-    explicit InterruptibleText(std::string& text) : StringSink(text), thread_(std::this_thread::get_id()) {}
-
-    // The thread state the lock was released from, while it is released.
-    void lockReleasedBy(PyThreadState* state) { released_ = state; }
-
-    void checkpoint() override {
-        // A deep conversion runs on a thread of its own, where the lock cannot be taken for this thread.
-        if (!released_ || !onMainThread() || std::this_thread::get_id() != thread_) return;
-        const auto now = std::chrono::steady_clock::now();
-        if (now < nextLook_) return;
-        nextLook_ = now + std::chrono::milliseconds(100);
-        PyEval_RestoreThread(released_);
-        const bool raised = PyErr_CheckSignals() != 0;
-        released_ = PyEval_SaveThread();
-        if (raised) throw Interrupted{};
-    }
-
-private:
-    static bool onMainThread() { return ::getpid() == static_cast<pid_t>(::syscall(SYS_gettid)); }
-
-    std::thread::id thread_;
-    PyThreadState* released_ = nullptr;
-    std::chrono::steady_clock::time_point nextLook_ = std::chrono::steady_clock::now() + std::chrono::milliseconds(100);
-};
-
 // Runs `work` with the interpreter lock released; its exception, if any, is
-// thrown again once the lock is held. A given sink may look for signals meanwhile.
+// thrown again once the lock is held. A sink's signal watch may look for
+// signals meanwhile.
 template <class Work>
-void withoutInterpreterLock(Work&& work, InterruptibleText* sink = nullptr) {
+void withoutInterpreterLock(Work&& work, python::SignalWatch* signals = nullptr) {
     std::exception_ptr failure;
     PyThreadState* state = PyEval_SaveThread();
-    if (sink) sink->lockReleasedBy(state);
+    if (signals) signals->lockReleasedBy(state);
     try {
         work();
     } catch (...) {
         failure = std::current_exception();
     }
-    if (sink) sink->lockReleasedBy(nullptr);
+    if (signals) signals->lockReleasedBy(nullptr);
     PyEval_RestoreThread(state);
     if (failure) std::rethrow_exception(failure);
 }
@@ -319,33 +282,11 @@ PyObject* textObject(std::string_view text) {
 // or a signal handler raised. C++ exceptions leave it only while the lock is held.
 PyObject* convertToStr(core::FileKind kind, const core::Input& input, const core::ConversionOptions& options,
                        core::Diagnosis& result) {
-    // Each thread keeps a small text buffer between calls, so converting many
-    // small files does not map, fault in and unmap fresh memory for each; the
-    // buffer of a larger document is let go, so that a pool of idle threads
-    // holds a few MiB each at most.
-    constexpr std::size_t kKeptCapacity = std::size_t{4} << 20;
-    thread_local std::string xml;
-    xml.clear();
-    struct LetGoOfLargeBuffer {
-        ~LetGoOfLargeBuffer() {
-            if (xml.capacity() > kKeptCapacity) std::string().swap(xml);
-        }
-    } letGo;
-    // Only making the str object needs the lock: the conversion, measuring the
-    // text and filling in the characters run while other threads do.
-    std::string_view text;
-    std::optional<python::StrShape> shape;
-    InterruptibleText sink(xml);
-    withoutInterpreterLock(
-        [&] {
-            result = core::convert(kind, input, sink, options);
-            text = core::text::upToFirstNul(xml);
-            shape = python::measureUtf8(text);
-        },
-        &sink);
-    PyObject* str = shape ? python::newStr(*shape) : textObject(text);
-    if (str && shape) withoutInterpreterLock([&] { python::fillStr(str, text); });
-    return str;
+    python::SignalWatch signals;
+    python::StrSink sink(signals);
+    withoutInterpreterLock([&] { result = core::convert(kind, input, sink, options); }, &signals);
+    if (!result.complete()) sink.takeBack();
+    return sink.takeStr();
 }
 
 // The body of the getters: a file that cannot be opened gives "".
@@ -422,10 +363,11 @@ void raiseReadError(const core::Diagnosis& result, PyObject* path) {
 // did not read) the pair; raised instead: the OSError of a file that cannot be
 // opened, Dexmor.error for a document over its budget, and with `strict`
 // Dexmor.ReadError for a file that does not read as binary.
-PyObject* conversionResult(const core::Diagnosis& result, Ref str, PyObject* path, bool strict, bool withDiagnosis) {
+// True, with the exception set, when the result is one of those.
+bool raisedForResult(const core::Diagnosis& result, PyObject* path, bool strict) {
     if (!result.opened) {
         raiseUnopened(result, path);
-        return nullptr;
+        return true;
     }
     if (result.exceededBudget) {
         const unsigned long long budget = *result.exceededBudget;
@@ -435,12 +377,17 @@ PyObject* conversionResult(const core::Diagnosis& result, Ref str, PyObject* pat
         else
             PyErr_Format(moduleError, "the XML would exceed %llu bytes (the output budget; max_output to change it)",
                          budget);
-        return nullptr;
+        return true;
     }
     if (strict && !result.readsAsBinary) {
         raiseReadError(result, path);
-        return nullptr;
+        return true;
     }
+    return false;
+}
+
+PyObject* conversionResult(const core::Diagnosis& result, Ref str, PyObject* path, bool strict, bool withDiagnosis) {
+    if (raisedForResult(result, path, strict)) return nullptr;
     if (!withDiagnosis) return str.release();
     const Ref reason(result.readsAsBinary ? Py_NewRef(Py_None) : lenientText(result.reason()));
     return reason ? PyTuple_Pack(2, str.get(), reason.get()) : nullptr;
@@ -451,12 +398,55 @@ struct Keywords {
     PyObject* kind = Py_None;
     int strict = 0;
     PyObject* maxOutput = Py_None;
+    PyObject* out = Py_None;
 };
+
+// convert(path, out=DEST): the document written to DEST, a path (the file takes
+// its place only once the document is whole; on any failure an earlier file
+// there is left as it was) or a binary file object (handed the document piece
+// by piece: a library is read through first, so nothing is written for one that
+// does not read; a document over its budget raises with part of it written).
+// Returns None; raises as convert() does, and what the write raised.
+PyObject* convertPathTo(const FileArgument& file, const core::ConversionOptions& given, const Keywords& keywords) {
+    core::ConversionOptions options = given;
+    const bool strict = keywords.strict != 0;
+    options.passThrough = !strict; // a refused file writes nothing
+    const std::filesystem::path input(file.path.path);
+    python::SignalWatch signals;
+    core::Diagnosis result;
+    if (PyObject_HasAttrString(keywords.out, "write")) {
+        const Ref write(PyObject_GetAttrString(keywords.out, "write"));
+        if (!write) return nullptr;
+        python::FileObjectSink sink(write.get(), signals);
+        try {
+            withoutInterpreterLock([&] { result = core::convert(file.kind, input, sink, options); }, &signals);
+        } catch (const python::PythonRaised&) {
+            sink.restoreError();
+            return nullptr;
+        }
+        if (raisedForResult(result, file.path.text.get(), strict)) return nullptr;
+        Py_RETURN_NONE;
+    }
+    std::optional<PathArgument> target = pathArgument(keywords.out, "convert");
+    if (!target) return nullptr;
+    python::PathSink sink(target->path, signals);
+    withoutInterpreterLock([&] { result = core::convert(file.kind, input, sink, options); }, &signals);
+    if (raisedForResult(result, file.path.text.get(), strict)) return nullptr;
+    std::string error;
+    bool committed = false;
+    withoutInterpreterLock([&] { committed = sink.commit(&error); });
+    if (!committed) {
+        PyErr_Format(PyExc_OSError, "%U: the document could not be written: %s", target->text.get(), error.c_str());
+        return nullptr;
+    }
+    Py_RETURN_NONE;
+}
 
 PyObject* convertPath(const char* function, PyObject* argument, const Keywords& given, bool withDiagnosis) {
     const std::optional<FileArgument> file = fileArgument(argument, given.kind, function);
     core::ConversionOptions options;
     if (!file || !budgetArgument(given.maxOutput, function, options)) return nullptr;
+    if (given.out != Py_None) return convertPathTo(*file, options, given);
     core::Diagnosis result;
     Ref str(convertToStr(file->kind, std::filesystem::path(file->path.path), options, result));
     if (!str) return nullptr;
@@ -499,14 +489,15 @@ char kPositional[] = "";
 char kKind[] = "kind";
 char kStrict[] = "strict";
 char kMaxOutput[] = "max_output";
+char kOut[] = "out";
 
 PyObject* convert(PyObject*, PyObject* args, PyObject* kwargs) noexcept {
     return guarded([&]() -> PyObject* {
-        static char* names[] = {kPositional, kKind, kStrict, kMaxOutput, nullptr};
+        static char* names[] = {kPositional, kKind, kStrict, kMaxOutput, kOut, nullptr};
         PyObject* path = nullptr;
         Keywords given;
-        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "O|$OpO:convert", names, &path, &given.kind, &given.strict,
-                                         &given.maxOutput))
+        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "O|$OpOO:convert", names, &path, &given.kind, &given.strict,
+                                         &given.maxOutput, &given.out))
             return nullptr;
         return convertPath("convert", path, given, false);
     });
@@ -580,14 +571,15 @@ PyMethodDef methods[] = {
      "None when the file reads as a binary file of the kind its extension names\n"
      "(.zelmat or .zelopt); otherwise why not: the record, the byte offset and what\nwas wrong there."},
     {"convert", withKeywords<convert>(), METH_VARARGS | METH_KEYWORDS,
-     "convert($module, path, /, *, kind=None, strict=False, max_output=None)\n--\n\n"
+     "convert($module, path, /, *, kind=None, strict=False, max_output=None, out=None)\n--\n\n"
      "The XML document of the file at `path`, of the kind its extension names\n"
      "(.zelmat or .zelopt, any letter case) unless kind= (\"zelmat\" or \"zelopt\") says.\n"
      "A file that does not read as binary comes back as its own text; with strict=True\n"
      "it raises ReadError instead. A file that cannot be opened raises what open()\n"
      "raises (FileNotFoundError, PermissionError, IsADirectoryError...). max_output is\n"
      "the output budget in bytes (None: the larger of 256 MiB and 1,000 times the\n"
-     "file's size; 0: none); a document over it raises error."},
+     "file's size; 0: none); a document over it raises error. With out= (a path or a\n"
+     "binary file object) the document is written there instead and None returned."},
     {"convertWithDiagnosis", withKeywords<convertWithDiagnosis>(), METH_VARARGS | METH_KEYWORDS,
      "convertWithDiagnosis($module, path, /, *, kind=None, max_output=None)\n--\n\n"
      "(text, reason) from one reading of the file at `path`: text as convert() returns\n"

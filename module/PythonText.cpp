@@ -86,11 +86,9 @@ PyObject* newStr(const StrShape& shape) {
     return PyUnicode_New(static_cast<Py_ssize_t>(shape.characters), shape.maxChar);
 }
 
-void fillStr(PyObject* str, std::string_view utf8) {
-    void* characters = PyUnicode_DATA(str);
+void decodeInto(PyObject* str, std::size_t at, std::string_view utf8) {
     const auto kind = static_cast<std::size_t>(PyUnicode_KIND(str));
-    // A large document's str is filled in memory that faults in huge pages.
-    core::adviseHugePages(characters, static_cast<std::size_t>(PyUnicode_GET_LENGTH(str)) * kind);
+    void* characters = static_cast<char*>(PyUnicode_DATA(str)) + at * kind;
     if (PyUnicode_IS_ASCII(str))
         std::memcpy(characters, utf8.data(), utf8.size());
     else if (kind == PyUnicode_1BYTE_KIND)
@@ -99,6 +97,13 @@ void fillStr(PyObject* str, std::string_view utf8) {
         decodeInto(utf8, static_cast<Py_UCS2*>(characters));
     else
         decodeInto(utf8, static_cast<Py_UCS4*>(characters));
+}
+
+void fillStr(PyObject* str, std::string_view utf8) {
+    // A large document's str is filled in memory that faults in huge pages.
+    core::adviseHugePages(PyUnicode_DATA(str),
+                          static_cast<std::size_t>(PyUnicode_GET_LENGTH(str)) * PyUnicode_KIND(str));
+    decodeInto(str, 0, utf8);
 }
 
 } // namespace dexmor::python

@@ -30,4 +30,8 @@ PyObject* newStr(const StrShape& shape);
 // from. Needs no interpreter lock: nothing else can see the str yet.
 void fillStr(PyObject* str, std::string_view utf8);
 
+// Sets the characters of a new str from index `at` on to those of `utf8`, which
+// is valid UTF-8 whose characters the str is wide and long enough to hold.
+void decodeInto(PyObject* str, std::size_t at, std::string_view utf8);
+
 } // namespace dexmor::python

@@ -142,7 +142,7 @@ def test_arguments_are_refused_as_open_refuses_them(tmp_path):
 
 
 def test_signatures_and_documentation():
-    assert str(inspect.signature(Dexmor.convert)) == "(path, /, *, kind=None, strict=False, max_output=None)"
+    assert str(inspect.signature(Dexmor.convert)) == "(path, /, *, kind=None, strict=False, max_output=None, out=None)"
     assert str(inspect.signature(Dexmor.convertBytes)) == "(data, /, kind, *, strict=False, max_output=None)"
     for name in ("diagnose", "convertWithDiagnosis", "convertBytesWithDiagnosis", "diagnoseBytes"):
         function = getattr(Dexmor, name)

@@ -55,6 +55,9 @@ a: str = Dexmor.getZelmatXml(path)
 b: str = Dexmor.getZeloptXml("scene.zelopt")
 c: Optional[str] = Dexmor.diagnose(os.fspath(path))
 d: str = Dexmor.convert(path, kind="zelmat", strict=True, max_output=0)
+with open("lib.xml", "wb") as sink:
+    nothing: None = Dexmor.convert(path, out=sink)
+Dexmor.convert(path, out=pathlib.Path("lib.xml"), strict=True)
 e: Tuple[str, Optional[str]] = Dexmor.convertWithDiagnosis("lib.zelmat", max_output=None)
 f: str = Dexmor.convertBytes(b"...", "zelopt", strict=False)
 g: Tuple[str, Optional[str]] = Dexmor.convertBytesWithDiagnosis(bytearray(b"..."), "zelmat")
@@ -83,9 +86,12 @@ def test_mypy_finds_the_stub_package_and_checks_callers(tmp_path):
     pytest.importorskip("mypy")
     run = run_mypy(tmp_path, TYPED_PROGRAM)
     assert run.returncode == 0, run.stdout + run.stderr
-    run = run_mypy(tmp_path, "import Dexmor\nx: int = Dexmor.convert(b'lib.zelmat')\n")
+    run = run_mypy(tmp_path, "import Dexmor\nx: int = Dexmor.convertBytes('lib', 'zelmat')\n"
+                             "y: str = Dexmor.convert(b'lib.zelmat')\nz: str = Dexmor.convert('lib.zelmat', out='x.xml')\n")
     assert run.returncode == 1
     assert "incompatible type" in run.stdout and "Incompatible types in assignment" in run.stdout
+    assert "typed.py:3: error: No overload variant" in run.stdout  # a bytes path
+    assert "typed.py:4: error: Incompatible types in assignment" in run.stdout  # out= returns None
 
 
 def test_stubtest_finds_the_stub_true_to_the_module():
