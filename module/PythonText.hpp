@@ -30,8 +30,19 @@ PyObject* newStr(const StrShape& shape);
 // from. Needs no interpreter lock: nothing else can see the str yet.
 void fillStr(PyObject* str, std::string_view utf8);
 
-// Sets the characters of a new str from index `at` on to those of `utf8`, which
-// is valid UTF-8 whose characters the str is wide and long enough to hold.
-void decodeInto(PyObject* str, std::size_t at, std::string_view utf8);
+// What decodeAt() did: the bytes of `utf8` it decoded into how many characters;
+// where it stopped early, the character the str is too narrow for (`wider`), or
+// that the text is not valid UTF-8 there (`invalid`).
+struct Decoded {
+    std::size_t bytes = 0;
+    std::size_t characters = 0;
+    Py_UCS4 wider = 0;
+    bool invalid = false;
+};
+
+// Decodes UTF-8 into the characters of a new str from index `at` on, as far as
+// the str's width holds them and the text is valid; the str must have room for
+// as many characters as `utf8` has bytes. Needs no interpreter lock.
+Decoded decodeAt(PyObject* str, std::size_t at, std::string_view utf8);
 
 } // namespace dexmor::python

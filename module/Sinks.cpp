@@ -101,13 +101,14 @@ void StrSink::write(std::string_view piece) {
 }
 
 void StrSink::append(std::string_view utf8) {
-    if (utf8.empty()) return;
-    const std::optional<StrShape> shape = measureUtf8(utf8);
-    if (!shape) throw std::runtime_error("the document is not valid UTF-8");
-    if (shape->maxChar > maxChar_) widen(shape->maxChar);
-    if (shape->characters > capacity_ - length_) reserve(shape->characters);
-    decodeInto(str_, length_, utf8);
-    length_ += shape->characters;
+    while (!utf8.empty()) {
+        if (utf8.size() > capacity_ - length_) reserve(utf8.size()); // no more characters than bytes
+        const Decoded decoded = decodeAt(str_, length_, utf8);
+        if (decoded.invalid) throw std::runtime_error("the document is not valid UTF-8");
+        length_ += decoded.characters;
+        utf8.remove_prefix(decoded.bytes);
+        if (decoded.wider) widen(decoded.wider <= 0xFF ? 0xFF : decoded.wider <= 0xFFFF ? 0xFFFF : 0x10FFFF);
+    }
 }
 
 void StrSink::reserve(std::size_t more) {
