@@ -11,6 +11,7 @@
 #include "Commands.hpp"
 #include "Inputs.hpp"
 #include "Options.hpp"
+#include "OutputSink.hpp"
 #include "Progress.hpp"
 
 #include <dexmor/dexmor.hpp>
@@ -276,28 +277,15 @@ int convertAll(const std::vector<Job>& jobs, const XmlArgs& args, unsigned threa
     return status;
 }
 
-// Streams each document to standard output in argument order, in writes of up
-// to a quarter megabyte; the exit status. A document that would exceed the
-// output budget ends the output: what was written of it stays, and nothing
-// more follows.
+// Streams each document to standard output in argument order; the exit status.
+// A document that would exceed the output budget ends the output: nothing more
+// follows, and what was written of it stays unless the output could take it back.
 int writeAllToStandardOutput(const std::vector<Source>& sources, const XmlArgs& args) {
-    constexpr std::size_t kWriteSize = std::size_t{1} << 18;
-    StandardOutput out;
-    std::string pending;
-    bool outputGone = false;
-    const auto send = [&](std::string_view text) {
-        pending.append(text);
-        if (pending.size() >= kWriteSize) {
-            outputGone = outputGone || !out.write(pending);
-            pending.clear();
-        }
-    };
-    core::CallbackSink toOutput([&](std::string_view piece) {
-        if (!outputGone) send(piece);
-    });
+    StandardOutputSink out;
     int status = Success;
     for (const Source& source : sources) {
-        UpToFirstNul cut(toOutput);
+        out.beginDocument();
+        UpToFirstNul cut(out);
         try {
             const Outcome outcome =
                 outcomeOf(source, core::convert(source.kind, source.input(), cut, args.options), args.strict);
@@ -308,10 +296,9 @@ int writeAllToStandardOutput(const std::vector<Source>& sources, const XmlArgs& 
             complain({shownName(source.name), ": conversion failed: ", error.what()});
             status = Failed;
         }
-        if (outputGone) break; // standard output is gone; the other documents have nowhere to go
+        if (out.gone()) break; // standard output is gone; the other documents have nowhere to go
     }
-    if (!pending.empty() && !outputGone) outputGone = !out.write(pending);
-    if (!out.finish() || outputGone) status = Failed;
+    if (!out.finish()) status = Failed;
     return status;
 }
 

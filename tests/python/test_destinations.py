@@ -128,3 +128,28 @@ def test_out_hands_a_file_object_every_byte(tmp_path):
     with pytest.raises(Dexmor.ReadError):
         Dexmor.convert(truncated, out=buffer, strict=True)
     assert buffer.getvalue() == b""
+
+
+def test_standard_output_into_a_file_withdraws_a_library_that_fails(tmp_path):
+    # A regular file can be truncated back, so the tool reads each library once
+    # and withdraws what it wrote of one that fails late (here past the first
+    # quarter megabyte written); a pipe gets the same bytes.
+    if not MAKE_SEEDS:
+        pytest.skip("needs make_seeds (DEXMOR_MAKE_SEEDS)")
+    big = tmp_path / "big.zelmat"
+    subprocess.run([MAKE_SEEDS, "--amplifier", "3000", "400", str(big)], check=True)
+    data = bytearray(big.read_bytes())
+    at = len(data) * 6 // 10
+    data[at:at + 48] = b"\xff" * 48  # one of the later layers
+    failing = tmp_path / "failing.zelmat"
+    failing.write_bytes(data)
+    assert "BRDF layer 2" in Dexmor.diagnose(failing) and Dexmor.convert(failing) == ""
+    assert len(Dexmor.convert(big)) > 1 << 20
+    again = tmp_path / "again.zelmat"
+    again.write_bytes(LIBRARY.read_bytes())
+    expected = (Dexmor.convert(LIBRARY) * 2).encode("utf-8")
+    arguments = [CLI, "xml", "-q", str(LIBRARY), str(failing), str(again)]
+    with open(tmp_path / "out.xml", "wb") as out:
+        assert subprocess.run(arguments, stdout=out).returncode == 0
+    assert (tmp_path / "out.xml").read_bytes() == expected
+    assert subprocess.run(arguments, capture_output=True).stdout == expected
