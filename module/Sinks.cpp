@@ -111,6 +111,11 @@ void StrSink::append(std::string_view utf8) {
     }
 }
 
+void StrSink::expect(std::size_t bytes) {
+    constexpr std::size_t kMostAhead = std::size_t{64} << 20;
+    if (!str_) reserve(std::min(bytes, kMostAhead));
+}
+
 void StrSink::reserve(std::size_t more) {
     constexpr std::size_t kFirstCapacity = 64 * 1024;
     const std::size_t grown = std::max({length_ + more, capacity_ + capacity_ / 4, kFirstCapacity});

@@ -61,6 +61,9 @@ public:
     void write(std::string_view piece) override;
     bool canTakeBack() const override { return true; }
     void takeBack() override;
+    // The first room made is what the conversion expects (up to 64 Mi characters),
+    // so a small document is not grown and copied again and again.
+    void expect(std::size_t bytes) override;
     void checkpoint() override { signals_.look(); }
 
     // The str of everything written; nullptr with an exception set when it cannot
