@@ -21,8 +21,6 @@ TEST(Archive, PrimitivesAreLittleEndianAndPacked) {
     ar.write(1.0);
     const auto bytes = bytesOf(ar);
     EXPECT_EQ(bytes, Image{}.f32({1, 0, 0, 0, 1, 0, 0, 0, 1, 1, 2, 3}).version(0, 3).flag(true).i32(-2).f64(1.0).bytes);
-    EXPECT_EQ((ByteVector(bytes.begin() + 48, bytes.begin() + 57)),
-              (ByteVector{0, 0, 3, 0, 1, 0xFE, 0xFF, 0xFF, 0xFF})); // version word, bool, -2
     QuickArchive back = archiveOver(bytes);
     EXPECT_EQ(back.get<Transform>(), (Transform{Matrix::identity(), Vector{1, 2, 3}}));
     EXPECT_EQ(back.get<VersionWord>(), VersionWord::make(0, 3));

@@ -165,12 +165,11 @@ void expectSameBase(const Base_BRDF& read, const B& expect) {
 // (Each kind's plugin type and default name: the golden documents.)
 TEST(BRDF, FactoryKindsAndDefaults) {
     for (std::int32_t kind : {0, 3, 6, 64, 128, -1, INT_MIN}) EXPECT_FALSE(createBRDF(kind)) << kind;
-    // Each reflection layer has a Fresnel transparency of its own, and so has its copy.
+    // Each reflection layer has a Fresnel transparency of its own (Phong and Blinn:
+    // the golden documents), and so has its copy.
     const auto mirror = boost::make_shared<Mirror_BRDF>();
     ASSERT_TRUE(dynamic_cast<FresnelTexture*>(mirror->transparencyTex.get()));
     EXPECT_NE(mirror->transparencyTex, Mirror_BRDF().transparencyTex);
-    EXPECT_TRUE(dynamic_cast<FresnelTexture*>(Phong_BRDF().transparencyTex.get()));
-    EXPECT_TRUE(dynamic_cast<FresnelTexture*>(Blinn_BRDF().transparencyTex.get()));
     const BRDFPtr copy = mirror->clone();
     auto& copied = static_cast<Mirror_BRDF&>(*copy).transparencyTex;
     EXPECT_NE(copied, mirror->transparencyTex);

@@ -45,7 +45,7 @@ TEST(Camera, BothVersionsReadEveryRow) {
     EXPECT_TRUE(expected.isEqual(cameraOfTheRecord(2, &version2)));
     PhysicalCamera camera;
     ASSERT_TRUE(readInto(camera, version1));
-    EXPECT_TRUE(camera.isEqual(expected)) << camera.firstDifference(expected);
+    EXPECT_TRUE(camera.isEqual(expected)) << differenceOf(camera, expected);
     EXPECT_EQ(recordOf(camera), version2);
 
     // Version 2 keeps keyed values with several keys.
@@ -54,7 +54,7 @@ TEST(Camera, BothVersionsReadEveryRow) {
     camera.focus_distance.setValue(1.0f, -2.0);
     PhysicalCamera back;
     ASSERT_TRUE(readInto(back, recordOf(camera)));
-    EXPECT_TRUE(back.isEqual(camera)) << back.firstDifference(camera);
+    EXPECT_TRUE(back.isEqual(camera)) << differenceOf(back, camera);
     EXPECT_TRUE(back.focal_length.keyCount() == 2 && back.focus_distance.valueAt(-1.0) == 1.0f);
     const CameraPtr copy = back.clone();
     EXPECT_TRUE(copy->kindId() == 0 && dynamic_cast<const PhysicalCamera&>(*copy).isEqual(camera));

@@ -8,9 +8,6 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <fstream>
-#include <iterator>
-
 using namespace OrvexKavorCore;
 using namespace testsupport;
 using testing::ElementsAre;
@@ -75,10 +72,7 @@ TEST(DocumentSurvey, WarnsOfEachThingAConsumerMayTripOver) {
 }
 
 TEST(DocumentSurvey, SeesTheSameDocumentStreamedOrWhole) {
-    const std::string sample = [] {
-        std::ifstream in(std::string(DEXMOR_SOURCE_DIR) + "/examples/sample.zelmat", std::ios::binary);
-        return std::string(std::istreambuf_iterator<char>(in), {});
-    }();
+    const std::string sample = sampleFile("sample.zelmat");
     ConversionOptions options;
     options.survey = true;
     std::string xml;

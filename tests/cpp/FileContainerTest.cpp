@@ -10,45 +10,13 @@
 #include <sys/stat.h>
 
 using namespace OrvexKavorCore;
-using testsupport::convertToXml;
+using namespace testsupport;
 namespace fs = std::filesystem;
 
 namespace {
 
-class TempDir {
-public:
-    TempDir() {
-        std::string pattern = (fs::temp_directory_path() / "dexmor-test-XXXXXX").string();
-        path_ = ::mkdtemp(pattern.data());
-    }
-    ~TempDir() {
-        std::error_code ec;
-        fs::remove_all(path_, ec);
-    }
-    fs::path file(const std::string& name, const std::string& content) const {
-        const fs::path p = path_ / name;
-        std::ofstream(p, std::ios::binary) << content;
-        return p;
-    }
-    const fs::path& path() const { return path_; }
-
-private:
-    fs::path path_;
-};
-
-std::string slurp(const fs::path& p) {
-    std::ifstream in(p, std::ios::binary);
-    return std::string(std::istreambuf_iterator<char>(in), {});
-}
-
 std::string header(std::uint16_t generation, std::uint32_t count, std::uint16_t first = 0) {
-    const auto bytes = testsupport::Image{}.version(first, generation).u32(count).bytes;
-    return {bytes.begin(), bytes.end()};
-}
-
-std::string archiveBytes(const QuickArchive& ar) {
-    const auto bytes = testsupport::bytesOf(ar);
-    return {bytes.begin(), bytes.end()};
+    return textOf(Image{}.version(first, generation).u32(count).bytes);
 }
 
 // A material whose record always fails to write.
@@ -72,8 +40,8 @@ TEST(MaterialFile, FramingOfTheThreeGenerations) {
     ASSERT_TRUE(gen1 && gen2);
     EXPECT_TRUE(gen1->generation == 1 && gen1->count == 1u);
     // Generation 1 loses every 0x0D byte, wherever it stands; generation 2 keeps them.
-    EXPECT_EQ(archiveBytes(gen1->archive), "\x01\x0A\x02");
-    EXPECT_EQ(archiveBytes(gen2->archive), run);
+    EXPECT_EQ(textOf(bytesOf(gen1->archive)), "\x01\x0A\x02");
+    EXPECT_EQ(textOf(bytesOf(gen2->archive)), run);
 
     QuickArchive image(1);
     image.write(std::int32_t{42});
@@ -133,7 +101,8 @@ TEST(MaterialFile, AFailedSaveKeepsThePreviousFileAndComposesAMessage) {
     file.add(m);
     EXPECT_FALSE(file.save(target));
     EXPECT_EQ(file.lastError(), "An error has occurred while attempting to serialize \"Oak\" - aborting zelmat creation");
-    EXPECT_EQ(slurp(target), "previous content");
+    std::ifstream in(target, std::ios::binary);
+    EXPECT_EQ(std::string(std::istreambuf_iterator<char>(in), {}), "previous content");
     EXPECT_EQ(std::distance(fs::directory_iterator(dir.path()), fs::directory_iterator()), 1);
 }
 

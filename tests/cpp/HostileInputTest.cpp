@@ -23,9 +23,7 @@
 #include <cmath>
 #include <cstring>
 #include <filesystem>
-#include <fstream>
 #include <functional>
-#include <iterator>
 #include <limits>
 #include <tuple>
 #include <sys/stat.h>
@@ -41,11 +39,9 @@ namespace {
 constexpr std::uint32_t kHuge = 4000000000u;
 constexpr double kInf = std::numeric_limits<double>::infinity();
 
-std::string asText(const ByteVector& bytes) { return {bytes.begin(), bytes.end()}; }
-
 // A material library of generation 2: the header, then the archive bytes as they are.
 std::string libraryFile(std::uint32_t count, const ByteVector& archive) {
-    return asText(Image{}.version(0, 2).u32(count).append(archive).bytes);
+    return textOf(Image{}.version(0, 2).u32(count).append(archive).bytes);
 }
 
 // The position of the only occurrence of `needle` in `bytes`.
@@ -55,8 +51,6 @@ std::size_t findOnce(const ByteVector& bytes, const ByteVector& needle) {
     EXPECT_EQ(std::search(at + 1, bytes.end(), needle.begin(), needle.end()), bytes.end());
     return static_cast<std::size_t>(at - bytes.begin());
 }
-
-void put32(ByteVector& bytes, std::size_t at, std::uint32_t value) { std::memcpy(bytes.data() + at, &value, 4); }
 
 // Reads a file's bytes as the conversion does; nullopt when it reads as binary.
 std::optional<ReadFailure> whyNotBinary(FileKind kind, const std::string& bytes) {
@@ -78,24 +72,13 @@ void expectDocumentOrText(FileKind kind, const std::string& bytes, const std::st
     EXPECT_EQ(out, text::decodeStoredText(text::upToFirstNul(bytes))) << what;
 }
 
-std::string sample(const char* name) {
-    std::ifstream in(fs::path(DEXMOR_SOURCE_DIR) / "examples" / name, std::ios::binary);
-    return {std::istreambuf_iterator<char>(in), {}};
-}
-
 // The record of a render-options set, with the camera's focal length as a marker.
 ByteVector optionsRecord(AllOptions& options) {
     options.camera.focal_length.setConstant(1234.5f);
     return testsupport::recordOf(options);
 }
 
-class HostileInput : public LibraryTest {
-protected:
-    void TearDown() override {
-        const ConversionContext fresh1; // a refused sky record may have changed it
-        LibraryTest::TearDown();
-    }
-};
+using HostileInput = LibraryTest; // (a fresh conversion context per test: FreshContextPerTest)
 
 } // namespace
 
@@ -104,12 +87,12 @@ protected:
 TEST_F(HostileInput, CountsOfFourBillionInASmallFileFailAtOnce) {
     AllOptions withKeys;
     ByteVector keys = optionsRecord(withKeys);
-    put32(keys, findOnce(keys, testsupport::recordOf(withKeys.camera.focal_length)) + 4, kHuge);
+    keys = withWord(keys, findOnce(keys, testsupport::recordOf(withKeys.camera.focal_length)) + 4, kHuge);
 
     AllOptions withChannels;
     withChannels.channels = {131, 100, 117};
     ByteVector channels = testsupport::recordOf(withChannels);
-    put32(channels, findOnce(channels, Image{}.u32(3).u32(131).u32(100).u32(117).bytes), kHuge);
+    channels = withWord(channels, findOnce(channels, Image{}.u32(3).u32(131).u32(100).u32(117).bytes), kHuge);
 
     const struct {
         const char* what;
@@ -117,7 +100,7 @@ TEST_F(HostileInput, CountsOfFourBillionInASmallFileFailAtOnce) {
         std::string bytes;
     } cases[] = {
         {"materials", FileKind::MaterialLibrary,
-         asText(Image{}.version(0, 3).u32(kHuge).u32(1).append(ByteVector(4096)).bytes)},
+         textOf(Image{}.version(0, 3).u32(kHuge).u32(1).append(ByteVector(4096)).bytes)},
         {"BRDF layers", FileKind::MaterialLibrary,
          libraryFile(1, Image{}.i32(BaseMaterial::kLayeredBRDF).version(0, MaterialLayeredBRDF::kInfo.version)
                             .u32(kHuge).bytes)},
@@ -126,8 +109,8 @@ TEST_F(HostileInput, CountsOfFourBillionInASmallFileFailAtOnce) {
         {"object names", FileKind::MaterialLibrary,
          libraryFile(1, Image{}.i32(BaseMaterial::kObjectExclusion).version(0, MaterialObjectExclusion::kInfo.version)
                         .i32(0).flag(false).u32(kHuge).bytes)},
-        {"animation keys", FileKind::RenderOptions, asText(keys)},
-        {"render channels", FileKind::RenderOptions, asText(channels)},
+        {"animation keys", FileKind::RenderOptions, textOf(keys)},
+        {"render channels", FileKind::RenderOptions, textOf(channels)},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(c.what);
@@ -174,7 +157,7 @@ TEST_F(HostileInput, NestingOfAHundredThousandLevelsFailsTheFileAtTheLimit) {
 TEST_F(HostileInput, EveryTruncationOfTheSamplesConverts) {
     for (const auto& [kind, name] : {std::pair{FileKind::MaterialLibrary, "sample.zelmat"},
                                      std::pair{FileKind::RenderOptions, "sample.zelopt"}}) {
-        const std::string whole = sample(name);
+        const std::string whole = sampleFile(name);
         ASSERT_FALSE(whole.empty()) << name;
         ASSERT_FALSE(whyNotBinary(kind, whole)) << name;
         for (std::size_t n = 0; n < whole.size(); ++n)
@@ -188,7 +171,7 @@ TEST_F(HostileInput, SingleByteChangesOfTheSamplesConvert) {
     // Bits flipped: all of them at even offsets, the lowest at odd ones.
     for (const auto& [kind, name, stride] : {std::tuple{FileKind::RenderOptions, "sample.zelopt", 1},
                                              std::tuple{FileKind::MaterialLibrary, "sample.zelmat", 29}}) {
-        const std::string whole = sample(name);
+        const std::string whole = sampleFile(name);
         ASSERT_FALSE(whole.empty()) << name;
         for (std::size_t at = 0; at < whole.size(); at += at < 12 ? 1 : stride) {
             std::string damaged = whole;
@@ -202,11 +185,9 @@ TEST_F(HostileInput, SingleByteChangesOfTheSamplesConvert) {
 
 TEST(HostileInputPaths, AFileWithoutReadPermissionGivesTheEmptyText) {
     // (A directory, a FIFO and a missing path: see FileContainerTest.)
-    std::string pattern = (fs::temp_directory_path() / "dexmor-locked-XXXXXX").string();
-    ASSERT_NE(::mkdtemp(pattern.data()), nullptr);
-    const fs::path dir = pattern, file = dir / "locked.zelmat";
-    std::ofstream(file) << "<Assets/>";
-    ASSERT_EQ(::chmod(dir.c_str(), 0755), 0);
+    const TempDir dir;
+    const fs::path file = dir.file("locked.zelmat", "<Assets/>");
+    ASSERT_EQ(::chmod(dir.path().c_str(), 0755), 0);
     ASSERT_EQ(::chmod(file.c_str(), 0), 0);
 
     const auto convertsToEmptyText = [&] {
@@ -228,8 +209,6 @@ TEST(HostileInputPaths, AFileWithoutReadPermissionGivesTheEmptyText) {
         ASSERT_EQ(::waitpid(child, &status, 0), child);
         EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0) << "child status " << status;
     }
-    std::error_code ec;
-    fs::remove_all(dir, ec);
 }
 
 // --- the reason of every reader family ---
@@ -267,12 +246,6 @@ MaterialPtr bumpWith(const TexturePtr& texture) {
 constexpr std::uint32_t kBadVersion = 99u << 16; // (0, 99)
 constexpr std::size_t kBumpTexture = 13;         // kind, version, bumpTexMult, present flag
 
-// `bytes` with the UInt32 at `at` replaced.
-ByteVector with(ByteVector bytes, std::size_t at, std::uint32_t value) {
-    put32(bytes, at, value);
-    return bytes;
-}
-
 std::vector<Damaged> damagedRecords() {
     using testsupport::recordOf;
     std::vector<Damaged> rows;
@@ -281,12 +254,12 @@ std::vector<Damaged> damagedRecords() {
         rows.push_back({family, std::move(bytes), std::move(read), std::move(path), offset, std::move(reason)});
     };
 
-    add("material", with(storedForm(bumpWith(nullptr)), 4, kBadVersion), readMaterial, "material 0", 8,
+    add("material", withWord(storedForm(bumpWith(nullptr)), 4, kBadVersion), readMaterial, "material 0", 8,
         "unknown bump material version (0, 99)");
 
     auto layered = make<MaterialLayeredBRDF>("Layers");
     layered->layers = {boost::make_shared<Diffuse_BRDF>()};
-    add("BRDF layer", with(storedForm(layered), 16, kBadVersion), readMaterial, "material 0 / BRDF layer 0",
+    add("BRDF layer", withWord(storedForm(layered), 16, kBadVersion), readMaterial, "material 0 / BRDF layer 0",
         20, "unknown diffuse BRDF version (0, 99)");
 
     // A host two-sided material stores its name ahead of its sides, so a failing
@@ -297,12 +270,12 @@ std::vector<Damaged> damagedRecords() {
     twoSided->back = make<MaterialLayeredBRDF>("Back");
     const ByteVector sides = storedForm(twoSided);
     const std::size_t front = findOnce(sides, testsupport::recordOf(*twoSided->front));
-    add("named material", with(sides, front, kBadVersion), readMaterial,
+    add("named material", withWord(sides, front, kBadVersion), readMaterial,
         R"(material 0 "Oak \"Heart\"\x09)" + std::string(48, 'x') + R"(..." / material "front")", front + 4,
         "unknown layered material version (0, 99)");
 
     const std::size_t texture = kBumpTexture + 4; // after the texture's kind id
-    add("texture", with(storedForm(bumpWith(boost::make_shared<AColorTexture>())), texture, kBadVersion),
+    add("texture", withWord(storedForm(bumpWith(boost::make_shared<AColorTexture>())), texture, kBadVersion),
         readMaterial, R"(material 0 / texture "bump_tex")", texture + 4, "unknown colour texture version (0, 99)");
 
     auto bitmap = boost::make_shared<BitmapTexture>();
@@ -310,53 +283,53 @@ std::vector<Damaged> damagedRecords() {
     bitmap->bitmap = boost::make_shared<BitmapBuffer>();
     const ByteVector withBitmap = storedForm(bumpWith(bitmap));
     const std::size_t uvwKind = texture + 4, uvw = texture + 12; // after the version; after both kind ids
-    add("UVW generator kind", with(withBitmap, uvwKind, 77), readMaterial, R"(material 0 / texture "bump_tex")",
+    add("UVW generator kind", withWord(withBitmap, uvwKind, 77), readMaterial, R"(material 0 / texture "bump_tex")",
         uvwKind + 4, "unknown UVW generator kind 77");
-    add("UVW generator", with(withBitmap, uvw, kBadVersion), readMaterial,
+    add("UVW generator", withWord(withBitmap, uvw, kBadVersion), readMaterial,
         R"(material 0 / texture "bump_tex" / UVW generator "uvwgen")", uvw + 4,
         "unknown channel UVW generator version (0, 99)");
     const std::size_t buffer = uvw + recordOf(*bitmap->uvwgen).size();
-    add("bitmap", with(withBitmap, buffer, kBadVersion), readMaterial,
+    add("bitmap", withWord(withBitmap, buffer, kBadVersion), readMaterial,
         R"(material 0 / texture "bump_tex" / bitmap "bitmap")", buffer + 4, "unknown bitmap buffer version (0, 99)");
 
     // The sky record ends with the default sun's record and a Bool.
     auto sky = boost::make_shared<SkyTexture>();
     const std::size_t sun = texture + recordOf(*sky).size() - 1 - recordOf(*sharedDefaultSun()).size();
-    add("light", with(storedForm(bumpWith(sky)), sun, kBadVersion), readMaterial,
+    add("light", withWord(storedForm(bumpWith(sky)), sun, kBadVersion), readMaterial,
         R"(material 0 / texture "bump_tex" / light "default sun")", sun + 4, "unknown sun light version (0, 99)");
 
     AllOptions options;
     options.params.lightCache.str1 = "cache-file-name";
     const ByteVector set = optionsRecord(options);
     const auto readOptions = [](QuickArchive& ar) { return AllOptions().readFromArchive(ar); };
-    add("options set", with(set, 0, VersionWord::make(1, 99).raw), readOptions, "", 4,
+    add("options set", withWord(set, 0, VersionWord::make(1, 99).raw), readOptions, "", 4,
         "unknown options version (1, 99)");
     const std::size_t text = findOnce(set, Image{}.text("cache-file-name").bytes);
-    add("settings section", with(set, text, kHuge), readOptions, "params / lightCache.str1", text + 4,
+    add("settings section", withWord(set, text, kHuge), readOptions, "params / lightCache.str1", text + 4,
         "a string of 4000000000 bytes");
     const std::size_t frameData = 4 + recordOf(options.params).size();
-    add("frame data", with(set, frameData, kBadVersion), readOptions, "frameData", frameData + 4,
+    add("frame data", withWord(set, frameData, kBadVersion), readOptions, "frameData", frameData + 4,
         "unknown frame data version (0, 99)");
     const std::size_t stampInfo = frameData + recordOf(options.frameData).size();
-    add("stamp info", with(set, stampInfo + 16, kHuge), readOptions, "stampInfo", stampInfo + 20,
+    add("stamp info", withWord(set, stampInfo + 16, kHuge), readOptions, "stampInfo", stampInfo + 20,
         "a string of 4000000000 bytes"); // after the version and three integers
     const std::size_t camera = stampInfo + recordOf(options.stampInfo).size();
-    add("camera", with(set, camera, kBadVersion), readOptions, "camera", camera + 4,
+    add("camera", withWord(set, camera, kBadVersion), readOptions, "camera", camera + 4,
         "unknown physical camera version (0, 99)");
     const std::size_t keys = findOnce(set, recordOf(options.camera.focal_length));
-    add("animated value", with(set, keys + 8, 4), readOptions, "camera / focal_length", keys + 12,
+    add("animated value", withWord(set, keys + 8, 4), readOptions, "camera / focal_length", keys + 12,
         "animated real key times of 4 bytes");
 
     RenderView view;
     const ByteVector viewRecord = recordOf(view);
     const std::size_t transform = findOnce(viewRecord, recordOf(view.transform));
-    add("render view", with(viewRecord, transform + 4, kHuge),
+    add("render view", withWord(viewRecord, transform + 4, kHuge),
         [](QuickArchive& ar) { return RenderView().readFromArchive(ar); }, "transform", transform + 8,
         "4000000000 keys do not fit");
 
     // Version, name, then the keys' record: version, count, time size, (flag,) keys.
     DefAnimTransformParam placement("placement");
-    add("animated parameter", with(recordOf(placement), 4 + 13 + 4, kHuge), readAs<DefAnimTransformParam>(), "",
+    add("animated parameter", withWord(recordOf(placement), 4 + 13 + 4, kHuge), readAs<DefAnimTransformParam>(), "",
         4 + 13 + 8, "4000000000 keys do not fit");
     DefAnimIntParam count("count");
     ByteVector nanKey = recordOf(count); // its only key: Float64 time, Int32 value
@@ -365,14 +338,14 @@ std::vector<Damaged> damagedRecords() {
         "key time that is not a number");
 
     DefSerialVectorListParam tverts("tverts");
-    add("list parameter", with(recordOf(tverts), 4, kHuge), readAs<DefSerialVectorListParam>(), "", 8,
+    add("list parameter", withWord(recordOf(tverts), 4, kHuge), readAs<DefSerialVectorListParam>(), "", 8,
         "vector list of 4000000000 elements");
     DefGeomMapChannel channels("mapping");
     auto channel = boost::make_shared<GeomMapChannel>(1);
     channel->setFaces(std::vector<std::int32_t>{0, 1, 2});
     channels.addChannel(channel);
     const std::size_t faces = 4 + 11 + 4 + 4 + 4 + 1; // list version, name, count; channel version, number, flag
-    add("map channel", with(recordOf(channels), faces + 8, 2), readAs<DefGeomMapChannel>(), "map channel 0 / faces",
+    add("map channel", withWord(recordOf(channels), faces + 8, 2), readAs<DefGeomMapChannel>(), "map channel 0 / faces",
         faces + 12, "integer list elements of 2 bytes");
     return rows;
 }

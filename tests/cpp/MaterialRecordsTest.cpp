@@ -134,11 +134,8 @@ std::function<void(const MaterialPtr&)> on(Check check) {
 } // namespace
 
 TEST_F(MaterialRecordsTest, RandomRoundTripsOfEveryKind) {
-    EXPECT_FALSE(createMaterial(15));
-    EXPECT_FALSE(createMaterial(-1));
-    std::string why;
-    EXPECT_FALSE(readStored(Image().i32(15).version(0, 1).bytes, &why));
-    EXPECT_EQ(why, "material: unknown material kind 15 at offset 4");
+    // (A stored unknown kind, with its place: FileContainerTest.)
+    EXPECT_FALSE(createMaterial(BaseMaterial::kKindCount) || createMaterial(-1));
     for (std::uint32_t seed = 1; seed <= 12; ++seed) {
         Random rnd(seed);
         for (std::int32_t kind = 0; kind < BaseMaterial::kKindCount; ++kind) {

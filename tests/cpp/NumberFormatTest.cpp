@@ -29,12 +29,7 @@ TEST(NumberFormat, Floats) {
         {-limits::quiet_NaN(), "-nan"}, {std::bit_cast<float>(0xFFC00001u), "-nan"},
     };
     for (const auto& [value, text] : cases) EXPECT_EQ(formatFloat(value), text) << value;
-
-    std::string out = "<r>";
-    appendFloat(out, 0.25f);
-    appendInteger(out, -2147483647 - 1);
-    appendInteger(out, 2147483647);
-    EXPECT_EQ(out, "<r>0.25-21474836482147483647");
+    // (Appending to a document, and the integers: the XML writer's golden documents.)
 }
 
 namespace {

@@ -72,12 +72,6 @@ OrvexParams readParams(QuickArchive ar) {
     return p;
 }
 
-// For failure messages: the first stored field that differs.
-std::string differenceOf(const OrvexParams& a, const OrvexParams& b) {
-    const char* name = a.firstDifference(b);
-    return name ? name : "no stored field";
-}
-
 void setUnstoredFields(KavorUtils::KavorParams& p) {
     p.imageSampler.subdivision_show_samples = 1, p.irradianceMap.interp_frames = 9, p.irradianceMap.multiple_views = 1;
     p.photonMap.show_calc_phase = 1, p.lightCache.adaptive_dirs_only = 1, p.lightCache.min_paths_per_sample = 3;

@@ -11,7 +11,6 @@
 
 #include <algorithm>
 #include <filesystem>
-#include <fstream>
 #include <pthread.h>
 
 using namespace OrvexKavorCore;
@@ -81,9 +80,10 @@ TEST(OutputBudget, IsExactAndAppliesToEveryOutcome) {
             StringSink whole(out);
             CallbackSink pieces([&out](std::string_view piece) { out.append(piece); });
             DocumentSink& sink = streaming ? static_cast<DocumentSink&>(pieces) : whole;
-            const auto run = [&](std::uint64_t budget) {
+            // (A structured binding is named through an init-capture: clang 14 cannot capture one.)
+            const auto run = [&, &input = bytes](std::uint64_t budget) {
                 out.clear();
-                return convert(FileKind::MaterialLibrary, Input::ofBytes(bytes), sink, {budget});
+                return convert(FileKind::MaterialLibrary, Input::ofBytes(input), sink, {budget});
             };
             EXPECT_TRUE(run(size).complete()) << size;
             EXPECT_EQ(out.size(), size);
@@ -134,13 +134,12 @@ TEST(SmallStacks, TheDeepestChainOfEveryNestedKindConvertsOnA128KiBThread) {
 TEST(UnluckyMoments, AFileWhoseSizeLiesIsNotReadNotTakenForEmpty) {
     // A file of the process file system says it holds 0 bytes and delivers more:
     // as a file that changed while it was read, twice.
-    const fs::path link = fs::temp_directory_path() / ("dexmor-lies-" + std::to_string(::getpid()) + ".zelmat");
-    fs::remove(link);
+    const TempDir dir;
+    const fs::path link = dir.path() / "lies.zelmat";
     fs::create_symlink("/proc/self/status", link);
     std::string xml;
     StringSink sink(xml);
     const Diagnosis result = convert(FileKind::MaterialLibrary, link, sink);
-    fs::remove(link);
     EXPECT_FALSE(result.opened);
     EXPECT_FALSE(result.complete());
     EXPECT_TRUE(result.reason().starts_with("the file changed while it was read")) << result.reason();
@@ -149,14 +148,13 @@ TEST(UnluckyMoments, AFileWhoseSizeLiesIsNotReadNotTakenForEmpty) {
 
 TEST(UnluckyMoments, AFileBeyondTheArchiveLimitIsReadOnlyUpToItsFirstNul) {
     // Sparse: four gibibytes that cost no disk, of which only the text is read.
-    const fs::path file = fs::temp_directory_path() / ("dexmor-huge-" + std::to_string(::getpid()) + ".zelmat");
-    std::ofstream(file, std::ios::binary) << "<Assets/>" << '\0' << "never read";
+    const TempDir dir;
+    const fs::path file = dir.file("huge.zelmat", std::string("<Assets/>\0never read", 20));
     fs::resize_file(file, (std::uint64_t{4} << 30) + 13);
     std::string xml;
     StringSink sink(xml);
     const Diagnosis result = convert(FileKind::MaterialLibrary, file, sink);
     const Diagnosis diagnosis = diagnose(FileKind::RenderOptions, file);
-    fs::remove(file);
     EXPECT_TRUE(result.complete());
     EXPECT_FALSE(result.readsAsBinary);
     EXPECT_EQ(result.reason(), "header: the file is larger than the 4 GiB an archive can hold at offset 0");

@@ -14,6 +14,7 @@
 #include <cmath>
 #include <cstdint>
 #include <cstdlib>
+#include <filesystem>
 #include <fstream>
 #include <initializer_list>
 #include <iterator>
@@ -148,6 +149,18 @@ std::string xmlOf(Object& object, const std::string& url) {
     return out;
 }
 
+// The whole document of one object written under `path`.
+template <class Object>
+std::string documentOf(Object& object, const std::string& path = "") {
+    std::string out;
+    OrvexKavorCore::AssetXmlWriter writer(out);
+    writer.beginDocument();
+    object.writeXml(writer, path);
+    writer.endDocument();
+    EXPECT_EQ(writer.depth(), 0u);
+    return out;
+}
+
 // Compares `actual` with the file tests/golden/`name`. With DEXMOR_UPDATE_GOLDEN=1
 // in the environment the file is rewritten from `actual` first (review the
 // difference before keeping it).
@@ -159,6 +172,40 @@ inline void expectGolden(const std::string& actual, const std::string& name) {
     const std::string expected{std::istreambuf_iterator<char>(in), {}};
     EXPECT_EQ(actual, expected) << name;
 }
+
+// The bytes of a sample file under examples/.
+inline std::string sampleFile(const std::string& name) {
+    std::ifstream in(std::string(DEXMOR_SOURCE_DIR) + "/examples/" + name, std::ios::binary);
+    return {std::istreambuf_iterator<char>(in), {}};
+}
+
+inline std::string textOf(const ByteVector& bytes) { return {bytes.begin(), bytes.end()}; }
+
+// A new directory under the temporary directory, removed with its content.
+class TempDir {
+public:
+    TempDir() {
+        std::string pattern = (std::filesystem::temp_directory_path() / "dexmor-test-XXXXXX").string();
+        if (!::mkdtemp(pattern.data())) ADD_FAILURE() << "cannot make " << pattern;
+        path_ = pattern;
+    }
+    TempDir(const TempDir&) = delete;
+    TempDir& operator=(const TempDir&) = delete;
+    ~TempDir() {
+        std::error_code ec;
+        std::filesystem::remove_all(path_, ec);
+    }
+    // Writes `content` to the file `name` in the directory.
+    std::filesystem::path file(const std::string& name, const std::string& content) const {
+        const std::filesystem::path p = path_ / name;
+        std::ofstream(p, std::ios::binary) << content;
+        return p;
+    }
+    const std::filesystem::path& path() const { return path_; }
+
+private:
+    std::filesystem::path path_;
+};
 
 inline std::size_t occurrences(const std::string& text, const std::string& what) {
     std::size_t n = 0;

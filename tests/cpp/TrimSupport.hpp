@@ -67,6 +67,13 @@ inline ByteVector withVersion(ByteVector bytes, std::uint16_t first, std::uint16
     return withWord(std::move(bytes), at, first | std::uint32_t{second} << 16);
 }
 
+// For failure messages: the first stored field in which `a` and `b` differ.
+template <class Block>
+std::string differenceOf(const Block& a, const Block& b) {
+    const char* name = a.firstDifference(b);
+    return name ? name : "no stored field";
+}
+
 // A record assembled by hand and the object it reads to: the defaults with the
 // values the record holds. Each call names a field and its stored type; numbers
 // take the next of 1, 2, 3 ..., so that a value read into another field, or a
