@@ -71,11 +71,6 @@ std::string readOnceIntoFile(const std::string& bytes, int* takenBack = nullptr)
     return file.text;
 }
 
-std::string sample(const char* name) {
-    std::ifstream in(std::string(DEXMOR_SOURCE_DIR) + "/examples/" + name, std::ios::binary);
-    return std::string(std::istreambuf_iterator<char>(in), {});
-}
-
 using Conversions = LibraryTest;
 
 TEST_F(Conversions, ReadOnceOrTwiceTheDocumentIsTheSame) {

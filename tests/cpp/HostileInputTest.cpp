@@ -78,11 +78,6 @@ void expectDocumentOrText(FileKind kind, const std::string& bytes, const std::st
     EXPECT_EQ(out, text::decodeStoredText(text::upToFirstNul(bytes))) << what;
 }
 
-std::string sample(const char* name) {
-    std::ifstream in(fs::path(DEXMOR_SOURCE_DIR) / "examples" / name, std::ios::binary);
-    return {std::istreambuf_iterator<char>(in), {}};
-}
-
 // The record of a render-options set, with the camera's focal length as a marker.
 ByteVector optionsRecord(AllOptions& options) {
     options.camera.focal_length.setConstant(1234.5f);
