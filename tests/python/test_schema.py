@@ -30,7 +30,9 @@ NOT_DOCUMENTS = {"xml_writer_calls.xml"}
 
 
 def dexmor(*args, **kwargs):
-    return subprocess.run([CLI, *map(str, args)], capture_output=True, timeout=300, **kwargs)
+    kwargs.setdefault("stdout", subprocess.PIPE)
+    kwargs.setdefault("stderr", subprocess.PIPE)
+    return subprocess.run([CLI, *map(str, args)], timeout=300, **kwargs)
 
 
 def xmllint(*args):
@@ -118,6 +120,12 @@ def test_the_samples_wrapped_are_the_plain_documents_in_the_root(tmp_path, name,
     assert plain == (Dexmor.getZelmatXml if kind == "zelmat" else Dexmor.getZeloptXml)(str(sample))
     assert text == f'{DECLARATION}<AssetDocument kind="{kind}">\n{plain}</AssetDocument>\n'
     assert Dexmor.convertBytes(sample.read_bytes(), kind, wrap=True) == text == wrapped(sample, kind)
+    # Written to a path or a regular file, without holding the document.
+    Dexmor.convert(sample, kind=kind, wrap=True, out=tmp_path / "out.xml")
+    with open(tmp_path / "stdout.xml", "wb") as stdout:
+        assert dexmor("xml", "--wrap", sample, stdout=stdout, stderr=subprocess.PIPE).returncode == 0
+    for written in ("out.xml", "stdout.xml"):
+        assert (tmp_path / written).read_text(encoding="utf-8") == text
     (tmp_path / "doc.xml").write_text(text, encoding="utf-8")
     assert_valid([tmp_path / "doc.xml"])
     root = ET.fromstring(text.encode())
