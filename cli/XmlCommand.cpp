@@ -1,4 +1,4 @@
-// dexmor xml [-o DIR] [-j N] [--max-output BYTES] [--kind KIND] [--strict] [-q] [--no-progress] FILE...
+// dexmor xml [-o DIR] [-j N] [--max-output BYTES] [--kind KIND] [--strict] [--wrap] [-q] [--no-progress] FILE...
 //
 // Converts each FILE (a folder: every file of both kinds beneath it; "-": standard
 // input) and writes its document to standard output (in argument order) or, with
@@ -79,6 +79,8 @@ std::optional<XmlArgs> parseXmlArgs(Args args, bool& help) {
             return parsed;
         } else if (arg == "--strict") {
             parsed.strict = true;
+        } else if (arg == "--wrap") {
+            parsed.options.wrap = true;
         } else if (arg == "-q" || arg == "--quiet") {
             parsed.quiet = true;
         } else if (arg == "--no-progress") {

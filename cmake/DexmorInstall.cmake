@@ -6,6 +6,7 @@
 #   lib/cmake/Dexmor/                  find_package(Dexmor CONFIG) with the target Dexmor::core
 #   lib/pkgconfig/dexmor.pc            for pkg-config
 #   bin/dexmor, share/man/man1/dexmor.1
+#   share/dexmor/dexmor-assets.rng     the schema of the wrapped asset document
 #   the module Dexmor, its type stub Dexmor.pyi and the stub package Dexmor-stubs
 #   (found by type checkers): in the user site when the prefix
 #   is the user base (~/.local), else in the interpreter's folder under the prefix
@@ -63,6 +64,8 @@ install(FILES ${PROJECT_BINARY_DIR}/package/dexmor.pc
 # ---- the tool and its manual page --------------------------------------------------
 install(TARGETS dexmor RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT Runtime)
 install(FILES ${PROJECT_BINARY_DIR}/docs/dexmor.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT Runtime)
+install(FILES ${PROJECT_SOURCE_DIR}/schema/dexmor-assets.rng DESTINATION ${CMAKE_INSTALL_DATADIR}/dexmor
+        COMPONENT Runtime)
 install(FILES ${PROJECT_SOURCE_DIR}/LICENSE ${PROJECT_SOURCE_DIR}/CHANGELOG.md ${PROJECT_SOURCE_DIR}/README.md
         DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT Runtime)
 

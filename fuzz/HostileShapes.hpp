@@ -14,6 +14,7 @@
 #include <cstring>
 #include <functional>
 #include <string>
+#include <vector>
 
 namespace hostile {
 
@@ -62,16 +63,53 @@ inline MaterialPtr textureChain(std::size_t depth) {
     return diffuseMaterial(texture);
 }
 
-// A library of generation 2 holding `material`; empty when it cannot be written.
-inline std::string libraryOf(const MaterialPtr& material) {
+
+// Names that try the document's escaping and the characters XML 1.0 cannot carry:
+// markup characters, C0 controls, U+FFFE and U+FFFF, bytes that are not UTF-8,
+// line breaks, characters beyond the Basic Multilingual Plane.
+inline std::vector<std::string> hostileNames() {
+    return {"a&b<c>\"d'e", "]]>", "Ctl\x01\x02\x1f", "Tab\tLine\nFeed\rReturn", "Not\xef\xbf\xbe",
+            "Not\xef\xbf\xbf", "Bytes\xff\xc0\x80\xed\xa0\x80", "Cut\xe2\x82", "Del\x7f\xc2\x85",
+            "Face\xf0\x9f\x98\x80", "&amp;"};
+}
+
+// A library with hostile names: per name, a material whose layer has a bitmap
+// texture with the name in its file path; an object exclusion listing every name
+// as an object; and a two-sided material whose back is a multi material, which
+// folds into no asset, so that its reference names no asset of the document.
+inline std::vector<MaterialPtr> hostileNameLibrary() {
+    std::vector<MaterialPtr> materials;
+    auto exclusion = boost::make_shared<MaterialObjectExclusion>();
+    exclusion->name = "Exclude <\x01>";
+    exclusion->baseMtl = diffuseMaterial();
+    for (const std::string& name : hostileNames()) {
+        MaterialPtr material = diffuseMaterial(makeBitmapTexture("C:\\maps\\" + name + ".png"));
+        material->name = name;
+        materials.push_back(material);
+        exclusion->objects.push_back(name);
+    }
+    materials.push_back(exclusion);
+    auto twoSided = boost::make_shared<Material2Sided>();
+    twoSided->name = "Sheet\x01";
+    twoSided->front = diffuseMaterial();
+    twoSided->back = boost::make_shared<MaterialMulti>();
+    twoSided->back->name = "Set\x02";
+    materials.push_back(twoSided);
+    return materials;
+}
+
+// A library of generation 2 holding `materials`; empty when one cannot be written.
+inline std::string libraryOf(const std::vector<MaterialPtr>& materials) {
     QuickArchive ar;
-    if (!writeMember(ar, material)) return {};
+    for (const MaterialPtr& material : materials)
+        if (!writeMember(ar, material)) return {};
     std::string bytes(8 + ar.writePosition(), '\0');
-    const std::uint32_t header[2] = {VersionWord::make(0, 2).raw, 1};
+    const std::uint32_t header[2] = {VersionWord::make(0, 2).raw, static_cast<std::uint32_t>(materials.size())};
     std::memcpy(bytes.data(), header, sizeof header);
     ar.getRaw(bytes.data() + 8, ar.writePosition());
     return bytes;
 }
+inline std::string libraryOf(const MaterialPtr& material) { return libraryOf(std::vector{material}); }
 
 // The deepest chain of a shape that still reads as a library: one level more
 // fails the file at the nesting limit.

@@ -8,6 +8,8 @@
 //            generator kind in a diffuse layer;
 //   opt_*    render options: the sample and the defaults cut after their record,
 //            and the sample in every options version the reader accepts.
+//   lib_hostile_names  names with markup, control characters and bytes that are
+//            not UTF-8 (make_seeds --hostile-names FILE writes it alone).
 // Every file is read back before it is kept; a form that does not read is left out.
 // The checked-in corpora are these files after libFuzzer's -merge=1.
 #include "HostileShapes.hpp"
@@ -180,6 +182,7 @@ BRDFPtr cheapestLayer() {
 
 void keepHostileShapes() {
     keepLibrary("lib_amplify_quoted_name_layers", {hostile::amplifier(2000, 40, cheapestLayer)});
+    keepLibrary("lib_hostile_names", hostile::hostileNameLibrary());
     keepLibrary("lib_deepest_bump_chain", {hostile::deepestChain(hostile::bumpChain)});
     keepLibrary("lib_deepest_texture_chain", {hostile::deepestChain(hostile::textureChain)});
 }
@@ -225,10 +228,17 @@ int main(int argc, char** argv) {
         std::ofstream(argv[2], std::ios::binary) << generation2(materials);
         return 0;
     }
+    if (argc == 3 && std::string_view(argv[1]) == "--hostile-names") {
+        // make_seeds --hostile-names FILE: a library of hostile names (see hostileNameLibrary).
+        const ConversionContext context;
+        std::ofstream(argv[2], std::ios::binary) << generation2(hostile::hostileNameLibrary());
+        return 0;
+    }
     if (argc != 3) {
         std::fprintf(stderr, "usage: make_seeds SAMPLE_DIR OUTPUT_DIR\n"
                              "       make_seeds --amplifier NAME_LENGTH LAYERS FILE\n"
-                             "       make_seeds --names FILE NAME...\n");
+                             "       make_seeds --names FILE NAME...\n"
+                             "       make_seeds --hostile-names FILE\n");
         return 2;
     }
     const fs::path samples = argv[1];

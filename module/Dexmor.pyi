@@ -113,7 +113,7 @@ def diagnose(path: _Path, /) -> Optional[str]:
 
 @overload
 def convert(__path: _Path, *, kind: Optional[_Kind] = None, strict: bool = False,
-            max_output: Optional[int] = None, out: None = None) -> str:
+            max_output: Optional[int] = None, out: None = None, wrap: bool = False) -> str:
     """Converts the file at `path` to its XML document.
 
     The file is read as `kind` ("zelmat" or "zelopt") when given, else as the kind
@@ -134,11 +134,17 @@ def convert(__path: _Path, *, kind: Optional[_Kind] = None, strict: bool = False
 
     The str holds each character at the width its widest character needs, built
     in place as the document is made: the call holds the document once.
+
+    With wrap=True the document comes in its wrapped form, which any XML tool
+    reads: an XML declaration and one root, <AssetDocument kind="zelmat"> (or
+    "zelopt"), around the <Assets> blocks, with U+FFFD for each character XML 1.0
+    cannot carry; a file passed through as text gives its text, escaped, in a
+    <passedThrough> element. The schema is share/dexmor/dexmor-assets.rng.
     """
 
 @overload
 def convert(__path: _Path, *, kind: Optional[_Kind] = None, strict: bool = False,
-            max_output: Optional[int] = None, out: Union[_Path, _BinaryWriter]) -> None:
+            max_output: Optional[int] = None, out: Union[_Path, _BinaryWriter], wrap: bool = False) -> None:
     """Converts the file at `path` and writes its XML document (UTF-8) to `out`
     instead of returning it, holding no more than a piece of it at a time.
 
@@ -167,7 +173,8 @@ def convertWithDiagnosis(path: _Path, /, *, kind: Optional[_Kind] = None,
     convert() does.
     """
 
-def convertBytes(data: _Data, /, kind: _Kind, *, strict: bool = False, max_output: Optional[int] = None) -> str:
+def convertBytes(data: _Data, /, kind: _Kind, *, strict: bool = False, max_output: Optional[int] = None,
+                 wrap: bool = False) -> str:
     """Converts the bytes of a file, held in memory, to its XML document.
 
     `data` is read in place, without a copy, as a file of `kind` ("zelmat" or

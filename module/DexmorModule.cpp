@@ -3,9 +3,9 @@
 //   Dexmor.getZelmatXml(path) -> str   XML of a material library (".zelmat")
 //   Dexmor.getZeloptXml(path) -> str   XML of a render-options file (".zelopt")
 //   Dexmor.diagnose(path) -> str|None  why a file does not read as binary, or None
-//   Dexmor.convert(path, *, kind, strict, max_output, out) -> str (None with out=)
+//   Dexmor.convert(path, *, kind, strict, max_output, out, wrap) -> str (None with out=)
 //   Dexmor.convertWithDiagnosis(path, *, kind, max_output) -> (str, str|None)
-//   Dexmor.convertBytes(data, kind, *, strict, max_output) -> str
+//   Dexmor.convertBytes(data, kind, *, strict, max_output, wrap) -> str
 //   Dexmor.convertBytesWithDiagnosis(data, kind, *, max_output) -> (str, str|None)
 //   Dexmor.diagnoseBytes(data, kind) -> str|None
 //   Dexmor.error                      raised when a path has the wrong extension,
@@ -399,6 +399,7 @@ struct Keywords {
     int strict = 0;
     PyObject* maxOutput = Py_None;
     PyObject* out = Py_None;
+    int wrap = 0;
 };
 
 // convert(path, out=DEST): the document written to DEST, a path (the file takes
@@ -446,6 +447,7 @@ PyObject* convertPath(const char* function, PyObject* argument, const Keywords& 
     const std::optional<FileArgument> file = fileArgument(argument, given.kind, function);
     core::ConversionOptions options;
     if (!file || !budgetArgument(given.maxOutput, function, options)) return nullptr;
+    options.wrap = given.wrap != 0;
     if (given.out != Py_None) return convertPathTo(*file, options, given);
     core::Diagnosis result;
     Ref str(convertToStr(file->kind, std::filesystem::path(file->path.path), options, result));
@@ -458,6 +460,7 @@ PyObject* convertBuffer(const char* function, const HeldBuffer& data, const Keyw
     const std::optional<core::FileKind> kind = kindArgument(given.kind, function);
     core::ConversionOptions options;
     if (!kind || !budgetArgument(given.maxOutput, function, options)) return nullptr;
+    options.wrap = given.wrap != 0;
     core::Diagnosis result;
     Ref str(convertToStr(*kind, data.input(), options, result));
     if (!str) return nullptr;
@@ -490,14 +493,15 @@ char kKind[] = "kind";
 char kStrict[] = "strict";
 char kMaxOutput[] = "max_output";
 char kOut[] = "out";
+char kWrap[] = "wrap";
 
 PyObject* convert(PyObject*, PyObject* args, PyObject* kwargs) noexcept {
     return guarded([&]() -> PyObject* {
-        static char* names[] = {kPositional, kKind, kStrict, kMaxOutput, kOut, nullptr};
+        static char* names[] = {kPositional, kKind, kStrict, kMaxOutput, kOut, kWrap, nullptr};
         PyObject* path = nullptr;
         Keywords given;
-        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "O|$OpOO:convert", names, &path, &given.kind, &given.strict,
-                                         &given.maxOutput, &given.out))
+        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "O|$OpOOp:convert", names, &path, &given.kind, &given.strict,
+                                         &given.maxOutput, &given.out, &given.wrap))
             return nullptr;
         return convertPath("convert", path, given, false);
     });
@@ -517,11 +521,11 @@ PyObject* convertWithDiagnosis(PyObject*, PyObject* args, PyObject* kwargs) noex
 
 PyObject* convertBytes(PyObject*, PyObject* args, PyObject* kwargs) noexcept {
     return guarded([&]() -> PyObject* {
-        static char* names[] = {kPositional, kKind, kStrict, kMaxOutput, nullptr};
+        static char* names[] = {kPositional, kKind, kStrict, kMaxOutput, kWrap, nullptr};
         HeldBuffer data;
         Keywords given;
-        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "y*O|$pO:convertBytes", names, &data.view, &given.kind,
-                                         &given.strict, &given.maxOutput))
+        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "y*O|$pOp:convertBytes", names, &data.view, &given.kind,
+                                         &given.strict, &given.maxOutput, &given.wrap))
             return nullptr;
         return convertBuffer("convertBytes", data, given, false);
     });
@@ -571,7 +575,7 @@ PyMethodDef methods[] = {
      "None when the file reads as a binary file of the kind its extension names\n"
      "(.zelmat or .zelopt); otherwise why not: the record, the byte offset and what\nwas wrong there."},
     {"convert", withKeywords<convert>(), METH_VARARGS | METH_KEYWORDS,
-     "convert($module, path, /, *, kind=None, strict=False, max_output=None, out=None)\n--\n\n"
+     "convert($module, path, /, *, kind=None, strict=False, max_output=None, out=None, wrap=False)\n--\n\n"
      "The XML document of the file at `path`, of the kind its extension names\n"
      "(.zelmat or .zelopt, any letter case) unless kind= (\"zelmat\" or \"zelopt\") says.\n"
      "A file that does not read as binary comes back as its own text; with strict=True\n"
@@ -579,14 +583,16 @@ PyMethodDef methods[] = {
      "raises (FileNotFoundError, PermissionError, IsADirectoryError...). max_output is\n"
      "the output budget in bytes (None: the larger of 256 MiB and 1,000 times the\n"
      "file's size; 0: none); a document over it raises error. With out= (a path or a\n"
-     "binary file object) the document is written there instead and None returned."},
+     "binary file object) the document is written there instead and None returned.\n"
+     "wrap=True gives the wrapped form: one well-formed XML document (a declaration\n"
+     "and the root <AssetDocument>), U+FFFD for each character XML 1.0 cannot carry."},
     {"convertWithDiagnosis", withKeywords<convertWithDiagnosis>(), METH_VARARGS | METH_KEYWORDS,
      "convertWithDiagnosis($module, path, /, *, kind=None, max_output=None)\n--\n\n"
      "(text, reason) from one reading of the file at `path`: text as convert() returns\n"
      "it, and reason None when the file read as binary, else why it did not (as\n"
      "diagnose() gives it). Raises as convert() does."},
     {"convertBytes", withKeywords<convertBytes>(), METH_VARARGS | METH_KEYWORDS,
-     "convertBytes($module, data, /, kind, *, strict=False, max_output=None)\n--\n\n"
+     "convertBytes($module, data, /, kind, *, strict=False, max_output=None, wrap=False)\n--\n\n"
      "The XML document of a file's bytes held in memory (bytes, bytearray, memoryview\n"
      "or any contiguous buffer), converted in place as kind (\"zelmat\" or \"zelopt\").\n"
      "Otherwise as convert(); ReadError.path is None."},

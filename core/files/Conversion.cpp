@@ -9,6 +9,7 @@
 #include "files/LibraryConversion.hpp"
 #include "files/OptionsConversion.hpp"
 #include "files/SinkWriter.hpp"
+#include "xml/XmlCharacters.hpp"
 #include "platform/FileIo.hpp"
 #include "platform/HugePages.hpp"
 #include "platform/Stack.hpp"
@@ -132,15 +133,52 @@ std::string passThroughText(const SharedBytes& bytes) {
 // Hands the conversion of `bytes` as a file of `kind` to `use`, on a stack deep
 // enough for any nesting the readers accept.
 template <class Use>
-Diagnosis withConversion(FileKind kind, const InputBytes& input, std::uint64_t budget, DocumentSurvey* survey, Use use) {
+Diagnosis withConversion(FileKind kind, const InputBytes& input, std::uint64_t budget, DocumentSurvey* survey,
+                         bool wrap, Use use) {
     if (input.overLimit) return tooLargeForAnArchive();
     Diagnosis result;
     runWithStack(kConversionStack, [&] {
         ConversionContext context;
-        result = kind == FileKind::MaterialLibrary ? use(LibraryConversion(context, input.bytes, budget, survey))
-                                                   : use(OptionsConversion(input.bytes, budget, survey));
+        result = kind == FileKind::MaterialLibrary
+                     ? use(LibraryConversion(context, input.bytes, budget, survey, wrap))
+                     : use(OptionsConversion(input.bytes, budget, survey, wrap));
     });
     return result;
+}
+
+// The pass-through text in the wrapped form: the root around one <passedThrough>
+// element holding the text, escaped and carried (see XmlCarrier). It is sent in
+// pieces of bounded size, and only once its whole size fits the budget.
+void sendWrappedText(DocumentSink& sink, FileKind kind, std::string_view text, std::uint64_t budget) {
+    const std::string start = wrappedDocumentStart(kind) + "<passedThrough>";
+    constexpr std::string_view kEnd = "</passedThrough>\n";
+    const auto eachPiece = [&](const auto& take) {
+        take(start);
+        std::string escaped, piece;
+        XmlCarrier carrier;
+        for (std::size_t at = 0; at < text.size();) {
+            // Runs end between characters (the text is UTF-8).
+            std::size_t end = std::min(text.size(), at + SinkWriter::kPieceSize);
+            while (end < text.size() && (static_cast<unsigned char>(text[end]) & 0xC0) == 0x80) ++end;
+            escaped.clear();
+            appendEscaped(escaped, text.substr(at, end - at));
+            piece.clear();
+            carrier.append(piece, escaped, true);
+            take(piece);
+            at = end;
+        }
+        take(kEnd);
+        take(kWrappedDocumentEnd);
+    };
+    if (budget != 0) {
+        std::uint64_t size = 0;
+        eachPiece([&size](std::string_view piece) { size += piece.size(); });
+        if (size > budget) throw OutputBudgetExceeded{budget};
+    }
+    eachPiece([&sink](std::string_view piece) {
+        sink.write(piece);
+        sink.checkpoint();
+    });
 }
 
 } // namespace
@@ -161,7 +199,7 @@ Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink, const C
     Diagnosis result;
     DocumentSurvey survey;
     try {
-        result = withConversion(kind, *bytes, budget, options.survey ? &survey : nullptr,
+        result = withConversion(kind, *bytes, budget, options.survey ? &survey : nullptr, options.wrap,
                                 [&sink](auto&& conversion) { return conversion.writeTo(sink); });
         if (options.survey && result.readsAsBinary) {
             result.materials = survey.materials();
@@ -171,7 +209,9 @@ Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink, const C
         if (!result.readsAsBinary) {
             const std::string text = passThroughText(bytes->bytes);
             result.fallbackLength = text.size();
-            if (options.passThrough) {
+            if (options.passThrough && options.wrap) {
+                sendWrappedText(sink, kind, text, budget);
+            } else if (options.passThrough) {
                 if (budget != 0 && text.size() > budget) throw OutputBudgetExceeded{budget};
                 sink.write(text);
             }
@@ -189,7 +229,7 @@ Diagnosis diagnose(FileKind kind, const Input& input) {
     const std::optional<InputBytes> bytes = bytesOf(input, error);
     if (!bytes) return unopened(std::move(error));
     Diagnosis result =
-        withConversion(kind, *bytes, 0, nullptr, [](auto&& conversion) { return conversion.readThrough(); });
+        withConversion(kind, *bytes, 0, nullptr, false, [](auto&& conversion) { return conversion.readThrough(); });
     if (!result.readsAsBinary) result.fallbackLength = passThroughText(bytes->bytes).size();
     result.opened = true;
     return result;

@@ -1,5 +1,7 @@
 #include "files/DocumentSurvey.hpp"
 
+#include "xml/XmlCharacters.hpp"
+
 #include <algorithm>
 
 namespace OrvexKavorCore {
@@ -48,19 +50,6 @@ std::string unescaped(std::string_view text) {
     return plain;
 }
 
-// Whether UTF-8 text holds a character XML 1.0 cannot carry: a C0 control other
-// than tab, line feed and carriage return, U+FFFE or U+FFFF.
-bool holdsCharacterXmlCannotCarry(std::string_view text) {
-    for (std::size_t i = 0; i < text.size(); ++i) {
-        const auto c = static_cast<unsigned char>(text[i]);
-        if (c < 0x20 && c != '\t' && c != '\n' && c != '\r') return true;
-        if (c == 0xEF && i + 2 < text.size() && static_cast<unsigned char>(text[i + 1]) == 0xBF &&
-            (static_cast<unsigned char>(text[i + 2]) & 0xFE) == 0xBE)
-            return true;
-    }
-    return false;
-}
-
 // A url in a warning: quoted, with the characters XML cannot carry shown as escapes.
 std::string quotedUrl(std::string_view url) {
     std::string shown = "\"";
@@ -76,6 +65,21 @@ std::string quotedUrl(std::string_view url) {
         }
     }
     return shown + "\"";
+}
+
+// Whether a line ends inside an element the writer puts on one line: a name with
+// a line break in an attribute or a value goes on to the next line.
+bool unfinished(std::string_view line) {
+    line.remove_prefix(std::min(line.find_first_not_of(' '), line.size()));
+    if (line.starts_with("<Asset ") || line.starts_with("<kavorplugin ") || line.starts_with("<parameter "))
+        return !line.ends_with('>');
+    for (const std::string_view tag : {"value", "entry"}) {
+        const std::size_t open = tag.size() + 2;
+        if (line.size() > open && line[0] == '<' && line.substr(1, tag.size()) == tag && line[open - 1] == '>' &&
+            !contentOf(line, tag))
+            return true;
+    }
+    return false;
 }
 
 } // namespace
@@ -94,14 +98,19 @@ void DocumentSurvey::take(std::string_view text) {
             partial_.append(text);
             return;
         }
-        if (partial_.empty()) {
-            line(text.substr(0, end));
-        } else {
-            partial_.append(text.substr(0, end));
-            line(partial_);
-            partial_.clear();
-        }
+        const std::string_view piece = text.substr(0, end);
         text.remove_prefix(end + 1);
+        if (partial_.empty() && !unfinished(piece)) {
+            line(piece);
+            continue;
+        }
+        partial_.append(piece);
+        if (unfinished(partial_)) {
+            partial_ += '\n';
+            continue;
+        }
+        line(partial_);
+        partial_.clear();
     }
 }
 
@@ -117,8 +126,11 @@ void DocumentSurvey::line(std::string_view text) {
         if (text == "</list>") expecting_ = Expecting::Nothing;
         return;
     }
+    // A reference names a url, whose asset the lint looks at (or it names none).
+    if (!text.starts_with("<Asset ") && holdsCharacterXmlCannotCarry(text)) noteUncarriable(material);
     if (text.starts_with("<Asset ")) {
         lastAsset_ = unescaped(attribute(text, "url"));
+        parameter_.clear();
         const std::string_view type = attribute(text, "type");
         assets_[lastAsset_].push_back(material);
         targets_.insert(lastAsset_);
@@ -127,10 +139,18 @@ void DocumentSurvey::line(std::string_view text) {
     } else if (text.starts_with("<kavorplugin ")) {
         targets_.insert(lastAsset_ + "/" + unescaped(attribute(text, "name")));
     } else if (text.starts_with("<parameter ")) {
+        parameter_ = unescaped(attribute(text, "name"));
         if (attribute(text, "type") == "plugin") expecting_ = Expecting::PluginValue;
         if (attribute(text, "type") == "list" && attribute(text, "listType") == "plugin")
             expecting_ = Expecting::PluginEntries;
     }
+}
+
+// Once for each parameter (a text may span lines; a list has many entries).
+void DocumentSurvey::noteUncarriable(int material) {
+    std::string warning = whereOf(material) + ": the parameter " + quotedUrl(parameter_) + " of the asset " +
+                          quotedUrl(lastAsset_) + " holds a character XML 1.0 cannot carry";
+    if (uncarriable_.empty() || uncarriable_.back() != warning) uncarriable_.push_back(std::move(warning));
 }
 
 std::string DocumentSurvey::whereOf(int material) const {
@@ -152,6 +172,7 @@ std::vector<std::string> DocumentSurvey::warnings() const {
         if (!targets_.contains(reference.target))
             found.push_back(whereOf(reference.material) + ": the reference " + quotedUrl(reference.target) +
                             " names no asset of the document");
+    found.insert(found.end(), uncarriable_.begin(), uncarriable_.end());
     return found;
 }
 

@@ -6,7 +6,8 @@
 //     one url, two layers of a material with one name);
 //   - a plugin reference that names no asset of the document (a two-sided side
 //     that is a material without an asset of its own);
-//   - an asset url holding a character XML 1.0 cannot carry.
+//   - an asset url holding a character XML 1.0 cannot carry, and any other
+//     parameter whose text holds one (the wrapped form writes U+FFFD there).
 // It works on the writer's lines (one element a line), so it sees exactly what a
 // consumer of the text sees. A reference names an asset either by its url or by
 // its url, "/" and its plugin name.
@@ -40,6 +41,7 @@ private:
     void line(std::string_view text);
     // "material 3 "Oak"", or "the document" before the first material.
     std::string whereOf(int material) const;
+    void noteUncarriable(int material);
 
     struct Reference {
         std::string target;
@@ -53,6 +55,8 @@ private:
     std::vector<Reference> references_;
     std::vector<std::string> settings_;
     std::string lastAsset_;
+    std::string parameter_; // the name of the parameter the lines belong to
+    std::vector<std::string> uncarriable_;
     bool lastAssetIsMaterial_ = false;
     enum class Expecting { Nothing, PluginValue, PluginEntries } expecting_ = Expecting::Nothing;
 };

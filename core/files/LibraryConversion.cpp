@@ -103,7 +103,7 @@ Diagnosis LibraryConversion::writeTo(DocumentSink& sink) {
 
 LibraryConversion::SingleReading LibraryConversion::writeReadingOnce(DocumentSink& sink, Diagnosis& result) {
     sink.expect(std::min(bytes_.size() * kExpectedGrowth, kMostExpectedAtOnce));
-    SinkWriter out(sink, budget_, survey_);
+    SinkWriter out(sink, budget_, survey_, form());
     DefaultSunWatch sunWatch;
     const bool read = readMaterials(result, [&](MaterialPtr&& material) {
         if (sunWatch.changedAfterReading()) return; // the text is written again by two readings
@@ -126,7 +126,7 @@ void LibraryConversion::writeReadingTwice(DocumentSink& sink, Diagnosis& result)
     const SunLight finalSun = defaultSun;
     defaultSun = pristineSun;
 
-    SinkWriter out(sink, budget_, survey_);
+    SinkWriter out(sink, budget_, survey_, form());
     readMaterials(result, [&](MaterialPtr&& material) {
         defaultSun = finalSun;
         out.beginMaterial(*material);

@@ -8,16 +8,18 @@
 #include "files/DocumentSurvey.hpp"
 
 #include <cstdint>
+#include <optional>
 
 namespace OrvexKavorCore {
 
 class LibraryConversion {
 public:
     // `budget`: the most bytes the document may have (0: no limit).
-    // A survey, when given, sees the document as it is written.
+    // A survey, when given, sees the document as it is written. `wrap`: the
+    // wrapped form (see SinkWriter).
     LibraryConversion(ConversionContext& context, const SharedBytes& bytes, std::uint64_t budget = 0,
-                      DocumentSurvey* survey = nullptr)
-        : context_(context), bytes_(bytes), budget_(budget), survey_(survey) {}
+                      DocumentSurvey* survey = nullptr, bool wrap = false)
+        : context_(context), bytes_(bytes), budget_(budget), survey_(survey), wrap_(wrap) {}
 
     // Reads every material, each dropped as soon as it has read.
     Diagnosis readThrough();
@@ -40,11 +42,15 @@ private:
     // Frames the bytes and reads every material, handing each to `take`; false,
     // with the failure in `result`, at the first that does not read.
     bool readMaterials(Diagnosis& result, const std::function<void(MaterialPtr&&)>& take);
+    std::optional<FileKind> form() const {
+        return wrap_ ? std::optional(FileKind::MaterialLibrary) : std::nullopt;
+    }
 
     ConversionContext& context_;
     const SharedBytes& bytes_;
     std::uint64_t budget_;
     DocumentSurvey* survey_;
+    bool wrap_;
 };
 
 } // namespace OrvexKavorCore

@@ -35,7 +35,7 @@ Diagnosis OptionsConversion::writeTo(DocumentSink& sink) {
     Diagnosis result;
     AllOptions options;
     if (!read(options, result)) return result;
-    SinkWriter out(sink, budget_, survey_);
+    SinkWriter out(sink, budget_, survey_, wrap_ ? std::optional(FileKind::RenderOptions) : std::nullopt);
     out.writer().beginDocument();
     options.writeXml(out.writer(), "");
     out.writer().endDocument();

@@ -14,9 +14,11 @@ class AllOptions;
 class OptionsConversion {
 public:
     // `budget`: the most bytes the document may have (0: no limit).
-    // A survey, when given, sees the document as it is written.
-    explicit OptionsConversion(const SharedBytes& bytes, std::uint64_t budget = 0, DocumentSurvey* survey = nullptr)
-        : bytes_(bytes), budget_(budget), survey_(survey) {}
+    // A survey, when given, sees the document as it is written. `wrap`: the
+    // wrapped form (see SinkWriter).
+    explicit OptionsConversion(const SharedBytes& bytes, std::uint64_t budget = 0, DocumentSurvey* survey = nullptr,
+                               bool wrap = false)
+        : bytes_(bytes), budget_(budget), survey_(survey), wrap_(wrap) {}
 
     Diagnosis readThrough();
     // Writes the document to `sink`; nothing when the bytes do not read as an
@@ -30,6 +32,7 @@ private:
     const SharedBytes& bytes_;
     std::uint64_t budget_;
     DocumentSurvey* survey_;
+    bool wrap_;
 };
 
 } // namespace OrvexKavorCore

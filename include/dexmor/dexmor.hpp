@@ -193,6 +193,15 @@ struct ConversionOptions {
     // Whether to fill in the Diagnosis's survey of the document (materials,
     // settings, warnings); it costs a look at every line.
     bool survey = false;
+    // The wrapped form, for XML tools: an XML declaration and one root element,
+    // <AssetDocument kind="zelmat"> (or "zelopt"), around the document's <Assets>
+    // blocks, and U+FFFD for each character XML 1.0 cannot carry (the survey's
+    // lint names where they were), so that the document is well-formed XML 1.0
+    // whatever the file holds. A file passed through as text gives its text,
+    // escaped, as the one <passedThrough> element of that root. The plain form
+    // (false) is the document as it has always been written: a library's blocks
+    // one after another, every character as the file gave it.
+    bool wrap = false;
 
     // The budget for an input of `inputSize` bytes; 0 for none.
     std::uint64_t outputBudgetFor(std::uint64_t inputSize) const;

@@ -26,26 +26,35 @@
 namespace testsupport {
 
 // The whole document of a conversion into a string (a library is read once).
-inline std::string convertToXml(OrvexKavorCore::FileKind kind, const OrvexKavorCore::Input& input) {
+inline std::string convertToXml(OrvexKavorCore::FileKind kind, const OrvexKavorCore::Input& input,
+                                const OrvexKavorCore::ConversionOptions& options = {}) {
     std::string xml;
     OrvexKavorCore::StringSink sink(xml);
-    OrvexKavorCore::convert(kind, input, sink);
+    OrvexKavorCore::convert(kind, input, sink, options);
     return xml;
 }
-inline std::string convertBytesToXml(OrvexKavorCore::FileKind kind, std::string_view bytes) {
-    return convertToXml(kind, OrvexKavorCore::Input::ofBytes(bytes));
+inline std::string convertBytesToXml(OrvexKavorCore::FileKind kind, std::string_view bytes,
+                                     const OrvexKavorCore::ConversionOptions& options = {}) {
+    return convertToXml(kind, OrvexKavorCore::Input::ofBytes(bytes), options);
 }
 // The pieces a destination that cannot take back receives (a library is read twice).
-inline std::vector<std::string> streamedPieces(OrvexKavorCore::FileKind kind, std::string_view bytes) {
+inline std::vector<std::string> streamedPieces(OrvexKavorCore::FileKind kind, std::string_view bytes,
+                                               const OrvexKavorCore::ConversionOptions& options = {}) {
     std::vector<std::string> pieces;
     OrvexKavorCore::CallbackSink sink([&pieces](std::string_view piece) { pieces.emplace_back(piece); });
-    OrvexKavorCore::convert(kind, OrvexKavorCore::Input::ofBytes(bytes), sink);
+    OrvexKavorCore::convert(kind, OrvexKavorCore::Input::ofBytes(bytes), sink, options);
     return pieces;
 }
-inline std::string streamedXml(OrvexKavorCore::FileKind kind, std::string_view bytes) {
+inline std::string streamedXml(OrvexKavorCore::FileKind kind, std::string_view bytes,
+                               const OrvexKavorCore::ConversionOptions& options = {}) {
     std::string xml;
-    for (const std::string& piece : streamedPieces(kind, bytes)) xml += piece;
+    for (const std::string& piece : streamedPieces(kind, bytes, options)) xml += piece;
     return xml;
+}
+// The bytes of a sample file in examples/.
+inline std::string sample(const char* name) {
+    std::ifstream in(std::string(DEXMOR_SOURCE_DIR) + "/examples/" + name, std::ios::binary);
+    return {std::istreambuf_iterator<char>(in), {}};
 }
 inline OrvexKavorCore::Diagnosis diagnoseBytes(OrvexKavorCore::FileKind kind, std::string_view bytes) {
     return OrvexKavorCore::diagnose(kind, OrvexKavorCore::Input::ofBytes(bytes));

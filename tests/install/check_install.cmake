@@ -1,6 +1,7 @@
 # Installs a build into a fresh prefix and uses it as its users would:
 #   1. cmake --install BUILD_DIR --prefix WORK_DIR/prefix;
-#   2. the installed dexmor converts SAMPLE (the reference for what follows);
+#   2. the installed dexmor converts SAMPLE (the reference for what follows), and
+#      its wrapped form is valid against the installed schema (with xmllint);
 #   3. a CMake project finds the package with find_package(Dexmor) and links Dexmor::core;
 #   4. the same program is compiled with nothing but the flags pkg-config gives;
 #   5. the module imports from the installed site-packages directory;
@@ -44,7 +45,7 @@ file(MAKE_DIRECTORY ${WORK_DIR})
 # 1. Install.
 run(${CMAKE_COMMAND} --install ${BUILD_DIR} --prefix ${prefix})
 foreach(file include/dexmor/dexmor.hpp include/dexmor/version.hpp include/dexmor/files/ZelMatFile.hpp
-             share/man/man1/dexmor.1)
+             share/man/man1/dexmor.1 share/dexmor/dexmor-assets.rng)
   if(NOT EXISTS ${prefix}/${file})
     message(FATAL_ERROR "not installed: ${file}")
   endif()
@@ -72,6 +73,13 @@ execute_process(COMMAND ${prefix}/bin/dexmor xml ${SAMPLE} RESULT_VARIABLE statu
 file(READ ${WORK_DIR}/reference.xml head LIMIT 9)
 if(NOT status EQUAL 0 OR NOT head STREQUAL "<Assets>\n")
   message(FATAL_ERROR "the installed dexmor did not convert ${SAMPLE} (${status}):\n${err}")
+endif()
+# Its wrapped form is valid against the installed schema.
+find_program(XMLLINT xmllint)
+if(XMLLINT)
+  run(${prefix}/bin/dexmor xml --wrap -o ${WORK_DIR}/wrapped ${SAMPLE})
+  get_filename_component(sample_name ${SAMPLE} NAME)
+  run(${XMLLINT} --noout --relaxng ${prefix}/share/dexmor/dexmor-assets.rng ${WORK_DIR}/wrapped/${sample_name}.xml)
 endif()
 
 # 3. find_package.

@@ -142,8 +142,9 @@ def test_arguments_are_refused_as_open_refuses_them(tmp_path):
 
 
 def test_signatures_and_documentation():
-    assert str(inspect.signature(Dexmor.convert)) == "(path, /, *, kind=None, strict=False, max_output=None, out=None)"
-    assert str(inspect.signature(Dexmor.convertBytes)) == "(data, /, kind, *, strict=False, max_output=None)"
+    assert str(inspect.signature(Dexmor.convert)) == \
+        "(path, /, *, kind=None, strict=False, max_output=None, out=None, wrap=False)"
+    assert str(inspect.signature(Dexmor.convertBytes)) == "(data, /, kind, *, strict=False, max_output=None, wrap=False)"
     for name in ("diagnose", "convertWithDiagnosis", "convertBytesWithDiagnosis", "diagnoseBytes"):
         function = getattr(Dexmor, name)
         assert inspect.signature(function).parameters and function.__doc__.strip(), name
