@@ -58,11 +58,16 @@ Decoded decodeChecked(std::string_view utf8, Unit* out, Py_UCS4 limit) {
         return Decoded{static_cast<std::size_t>(p - begin), static_cast<std::size_t>(o - out), wider, invalid};
     };
     while (p < end) {
-        std::uint64_t word;
-        if (end - p >= 8 && (std::memcpy(&word, p, 8), (word & kHighBits) == 0)) {
-            std::copy(p, p + 8, o); // eight ASCII characters
-            p += 8;
-            o += 8;
+        // A run of ASCII, found a word at a time, goes over in one copy.
+        const std::uint8_t* run = p;
+        for (std::uint64_t word; end - run >= 8 && (std::memcpy(&word, run, 8), (word & kHighBits) == 0);) run += 8;
+        if (run != p) {
+            if constexpr (sizeof(Unit) == 1)
+                std::memcpy(o, p, static_cast<std::size_t>(run - p));
+            else
+                std::copy(p, run, o);
+            o += run - p;
+            p = run;
             continue;
         }
         const std::uint32_t lead = *p;
