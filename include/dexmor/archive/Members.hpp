@@ -32,6 +32,8 @@ bool readMember(QuickArchive& ar, boost::shared_ptr<Base>& member, const char* n
     const auto kind = ar.get<std::int32_t>();
     boost::shared_ptr<Base> object = Family<Base>::create(kind);
     if (!object) return ar.fail(std::string("unknown ") + Family<Base>::word + " kind " + std::to_string(kind));
+    if (ReadObserver* observer = ar.observer()) [[unlikely]]
+        observer->selected(kind, typeid(*object));
     member = object;
     if constexpr (requires { object->name; }) {
         // A new object holds its kind's default name until its record's name is read.
