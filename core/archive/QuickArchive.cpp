@@ -178,24 +178,35 @@ void QuickArchive::write(const Transform& v) {
     write(v.offs);
 }
 
-bool QuickArchive::observedRaw(void* data, std::size_t length) {
-    ReadObserver* const observer = observer_;
+bool QuickArchive::observedCopy(void* data, std::size_t length, Encoding encoding) {
     const std::uint64_t start = readPos_;
     const bool complete = copyOut(data, length);
-    observer->value(start, length, Encoding::Raw, nullptr);
+    observer_->value(start, length, encoding, data);
     return complete;
+}
+
+// Reads a compound value while the observer is set aside (its parts are not
+// values of their own), then reports it whole.
+template <class T>
+void QuickArchive::observedCompound(T& v, Encoding encoding) {
+    ReadObserver* const observer = observer_;
+    const std::uint64_t start = readPos_;
+    observer_ = nullptr;
+    read(v);
+    observer_ = observer;
+    observer->value(start, readPos_ - start, encoding, &v);
 }
 
 void QuickArchive::read(bool& v) {
     if (observer_) [[unlikely]]
-        return observed(v, Encoding::Bool, [&] { read(v); });
+        return observedCompound(v, Encoding::Bool);
     std::uint8_t b = v ? 1 : 0;
     takeByte(b);
     v = b != 0;
 }
 void QuickArchive::read(Vector& v) {
     if (observer_) [[unlikely]]
-        return observed(v, Encoding::Vector, [&] { read(v); });
+        return observedCompound(v, Encoding::Vector);
     Vector t{};
     read(t.x);
     read(t.y);
@@ -204,7 +215,7 @@ void QuickArchive::read(Vector& v) {
 }
 void QuickArchive::read(Color& v) {
     if (observer_) [[unlikely]]
-        return observed(v, Encoding::Color, [&] { read(v); });
+        return observedCompound(v, Encoding::Color);
     Color t{};
     read(t.r);
     read(t.g);
@@ -213,7 +224,7 @@ void QuickArchive::read(Color& v) {
 }
 void QuickArchive::read(AColor& v) {
     if (observer_) [[unlikely]]
-        return observed(v, Encoding::AColor, [&] { read(v); });
+        return observedCompound(v, Encoding::AColor);
     AColor t{};
     read(t.r);
     read(t.g);
@@ -223,12 +234,12 @@ void QuickArchive::read(AColor& v) {
 }
 void QuickArchive::read(Matrix& v) {
     if (observer_) [[unlikely]]
-        return observed(v, Encoding::Matrix, [&] { read(v); });
+        return observedCompound(v, Encoding::Matrix);
     for (Vector& column : v.m) read(column);
 }
 void QuickArchive::read(Transform& v) {
     if (observer_) [[unlikely]]
-        return observed(v, Encoding::Transform, [&] { read(v); });
+        return observedCompound(v, Encoding::Transform);
     read(v.m);
     read(v.offs);
 }
@@ -450,6 +461,10 @@ bool QuickArchive::checkVersion(VersionWord version, std::uint16_t latest, std::
 bool QuickArchive::fail(std::string_view reason) {
     if (!failure_) failure_ = ReadFailure{std::string(reason), readPos_, recordPath()};
     return false;
+}
+
+void QuickArchive::Scope::reportEnter(const char* what, const char* name, std::int64_t index) {
+    ar_.observer_->enter(what, name, index, nests_);
 }
 
 void QuickArchive::Scope::reportLeave() {

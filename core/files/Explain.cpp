@@ -306,6 +306,9 @@ public:
         : layout_(layout), fileSize_(fileSize), failedFrom_(failedFrom), cutFrom_(cutFrom), nodeLimit_(nodeLimit) {}
 
     void walk(ExplainedNode& node) {
+        // Chunk markers belong to the archive: they are shown inside its node.
+        const bool wasInArchive = inArchive_;
+        inArchive_ = inArchive_ || node.kind == "archive";
         std::vector<ExplainedNode> children;
         children.reserve(node.children.size());
         for (ExplainedNode& child : node.children) {
@@ -326,6 +329,7 @@ public:
         }
         if (node.kind == "archive" || node.kind == "file") fillTo(children, node.end());
         node.children = std::move(children);
+        inArchive_ = wasInArchive;
     }
 
 private:
@@ -352,7 +356,7 @@ private:
 
     // Chunk markers for every chunk that begins at or before `offset`.
     void markChunks(std::vector<ExplainedNode>& out, std::uint64_t offset) {
-        while (nextChunk_ < layout_.chunks && chunkStart(nextChunk_) <= offset &&
+        while (inArchive_ && nextChunk_ < layout_.chunks && chunkStart(nextChunk_) <= offset &&
                chunkStart(nextChunk_) < fileSize_) {
             ExplainedNode marker;
             marker.kind = "chunk";
@@ -423,6 +427,7 @@ private:
     std::size_t nodeLimit_;
     std::uint64_t cursor_ = 0;
     std::uint64_t nextChunk_ = 0;
+    bool inArchive_ = false;
 };
 
 ExplainedNode failureNode(const ReadFailure& failure) {

@@ -27,7 +27,6 @@
 #include <optional>
 #include <string>
 #include <string_view>
-#include <type_traits>
 #include <typeinfo>
 #include <vector>
 
@@ -71,7 +70,7 @@ public:
         String,  // value: the std::string as read (up to its first NUL)
         WString, // value: the decoded std::string
         Bytes,   // a count-prefixed block; value: the stored count (std::uint32_t)
-        Raw,     // bytes copied as they are; value: nullptr
+        Raw,     // bytes copied as they are; value: the bytes
         Skipped, // bytes passed over; value: nullptr
     };
 
@@ -134,7 +133,7 @@ public:
     void putByte(std::uint8_t b);
     bool getByte(std::uint8_t& b) {
         if (observer_) [[unlikely]]
-            return observed(b, Encoding::UInt8, [&] { return takeByte(b); });
+            return observedCopy(&b, 1, Encoding::UInt8);
         return takeByte(b);
     }
     void putRaw(const void* data, std::size_t length);
@@ -142,7 +141,7 @@ public:
     // True when every byte was delivered.
     bool getRaw(void* data, std::size_t length) {
         if (observer_) [[unlikely]]
-            return observedRaw(data, length);
+            return observedCopy(data, length, Encoding::Raw);
         return copyOut(data, length);
     }
 
@@ -173,11 +172,7 @@ public:
     void read(AColor& v);
     void read(Matrix& v);
     void read(Transform& v);
-    void read(VersionWord& v) {
-        if (observer_) [[unlikely]]
-            return observed(v, Encoding::VersionWord, [&] { copyOut(&v.raw, sizeof v.raw); });
-        copyOut(&v.raw, sizeof v.raw);
-    }
+    void read(VersionWord& v) { readPlain(v.raw, Encoding::VersionWord); }
 
     // Reads a value into a fresh zero-initialised local and returns it.
     template <class T>
@@ -251,7 +246,9 @@ public:
             : Scope(ar, what, name, index, true) {}
         // A label only (a field of a flat record): does not count as nesting.
         static Scope label(QuickArchive& ar, const char* name) { return Scope(ar, nullptr, name, -1, false); }
-        ~Scope() {
+        // Scopes open and close for every field of a record: they stay inline, the
+        // reports to an observer out of line.
+        [[gnu::always_inline]] ~Scope() {
             if (ar_.observer_) [[unlikely]]
                 reportLeave();
             if (nests_) --ar_.nesting_;
@@ -269,16 +266,18 @@ public:
         }
 
     private:
-        Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index, bool nests)
+        [[gnu::always_inline]] Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index,
+                                     bool nests)
             : ar_(ar), nests_(nests), pushed_(ar.frames_.size() < kMaxNesting), ok_(true) {
             // The path is kept only up to the limit: deeper frames add nothing a user needs.
             if (pushed_) ar_.frames_.push_back(Frame{what, name, index, {}});
             if (ar_.observer_) [[unlikely]]
-                ar_.observer_->enter(what, name, index, nests);
+                reportEnter(what, name, index);
             if (nests_ && ++ar_.nesting_ > kMaxNesting) tooDeep();
         }
         void tooDeep();
-        void reportLeave();
+        [[gnu::cold]] void reportEnter(const char* what, const char* name, std::int64_t index);
+        [[gnu::cold]] void reportLeave();
         QuickArchive& ar_;
         bool nests_;
         bool pushed_;
@@ -321,32 +320,16 @@ private:
 
     template <class T>
     void readPlain(T& v, Encoding encoding) {
-        if (observer_) [[unlikely]]
-            return observed(v, encoding, [&] { copyOut(&v, sizeof v); });
+        if (observer_) [[unlikely]] {
+            observedCopy(&v, sizeof v, encoding);
+            return;
+        }
         copyOut(&v, sizeof v);
     }
-    // Reads with `read` while the observer is set aside (the parts of a value are
-    // not values of their own), then reports the value whole.
-    template <class T, class Read>
-    std::invoke_result_t<Read&> observed(T& v, Encoding encoding, Read read) {
-        ReadObserver* const observer = observer_;
-        const std::uint64_t start = readPos_;
-        observer_ = nullptr;
-        struct Restore {
-            QuickArchive& ar;
-            ReadObserver* observer;
-            ~Restore() { ar.observer_ = observer; }
-        } restore{*this, observer};
-        if constexpr (std::is_void_v<decltype(read())>) {
-            read();
-            observer->value(start, readPos_ - start, encoding, &v);
-        } else {
-            const auto result = read();
-            observer->value(start, readPos_ - start, encoding, &v);
-            return result;
-        }
-    }
-    bool observedRaw(void* data, std::size_t length);
+    // The reads while an observer watches, out of the way of the plain ones.
+    [[gnu::cold]] bool observedCopy(void* data, std::size_t length, Encoding encoding);
+    template <class T>
+    void observedCompound(T& v, Encoding encoding);
     bool observedCounted(std::string& out, Encoding encoding);
     void reportRefusedCount(std::uint64_t start);
 
