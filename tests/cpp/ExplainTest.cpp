@@ -11,7 +11,6 @@
 #include <fstream>
 #include <iterator>
 #include <map>
-#include <regex>
 #include <set>
 #include <string>
 #include <vector>
@@ -138,13 +137,19 @@ TEST(Explain, AHandAssembledOptionsFileCutInsideItsParameterBlock) {
     testsupport::expectGolden(text, "explain_short_options.txt");
 }
 
-// type="float|integer|bool" name="..." values of one asset of an XML document.
+// type="float|integer|bool" name="..." values of the parameters of an XML document.
 std::map<std::string, std::string> plainParameters(const std::string& xml) {
-    static const std::regex parameter(
-        R"re(<parameter type="(?:float|integer|bool)" name="([^"]+)"[^>]*>\s*<value>([^<]*)</value>)re");
     std::map<std::string, std::string> values;
-    for (auto it = std::sregex_iterator(xml.begin(), xml.end(), parameter); it != std::sregex_iterator(); ++it)
-        values.emplace((*it)[1].str(), (*it)[2].str());
+    for (std::size_t at = xml.find("<parameter type=\""); at != std::string::npos;
+         at = xml.find("<parameter type=\"", at + 1)) {
+        const std::size_t typeStart = at + 17;
+        const std::string type = xml.substr(typeStart, xml.find('"', typeStart) - typeStart);
+        if (type != "float" && type != "integer" && type != "bool") continue;
+        const std::size_t nameStart = xml.find("name=\"", typeStart) + 6;
+        const std::string name = xml.substr(nameStart, xml.find('"', nameStart) - nameStart);
+        const std::size_t valueStart = xml.find("<value>", nameStart) + 7;
+        values.emplace(name, xml.substr(valueStart, xml.find("</value>", valueStart) - valueStart));
+    }
     return values;
 }
 
