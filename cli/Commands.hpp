@@ -7,5 +7,6 @@ namespace dexmor {
 int runXml(Args args);
 int runCheck(Args args);
 int runList(Args args);
+int runExplain(Args args);
 
 } // namespace dexmor

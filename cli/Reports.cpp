@@ -35,6 +35,18 @@ std::optional<ReportArgs> parseReportArgs(Args args, std::string_view command, i
             parsed.json = true;
         } else if (arg == "--strict" && command == "check") {
             parsed.strict = true;
+        } else if (command == "explain" && (arg.starts_with("--offset") || arg.starts_with("--depth"))) {
+            const bool isOffset = arg.starts_with("--offset");
+            const Match found = optionValue(args, i, "", isOffset ? "--offset" : "--depth", value);
+            const std::optional<std::uint64_t> number = found == Match::Found ? parseBytes(value) : std::nullopt;
+            if (!number || (!isOffset && *number > 1000))
+                return usageError({command, ": option ", isOffset ? "--offset" : "--depth", " needs a number",
+                                   isOffset ? "" : " up to 1000"}),
+                       std::nullopt;
+            if (isOffset)
+                parsed.offset = *number;
+            else
+                parsed.depth = static_cast<unsigned>(*number);
         } else if (const Match kind = optionValue(args, i, "", "--kind", value); kind != Match::No) {
             if (kind == Match::Missing) return usageError({command, ": option ", arg, " needs zelmat or zelopt"}), std::nullopt;
             parsed.kind = parseKind(value);

@@ -6,6 +6,7 @@
 
 #include <dexmor/dexmor.hpp>
 
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -16,11 +17,15 @@ namespace dexmor {
 struct ReportArgs {
     bool json = false;
     bool strict = false;
+    // explain: --offset N, --depth K
+    std::optional<std::uint64_t> offset;
+    std::optional<unsigned> depth;
     std::optional<OrvexKavorCore::FileKind> kind;
     std::vector<std::string_view> files;
 };
 
-// Parses "[--json] [--strict] [--kind KIND] FILE..." for `command`; nullopt after
+// Parses "[--json] [--strict] [--kind KIND] FILE..." for `command` (explain:
+// "[--json] [--offset N] [--depth K] [--kind KIND] FILE..."); nullopt after
 // a usage message, or with `exitStatus` set when the arguments ask for help.
 std::optional<ReportArgs> parseReportArgs(Args args, std::string_view command, int& exitStatus);
 

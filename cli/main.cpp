@@ -100,6 +100,16 @@ const std::string_view helpText =
     "      version and the settings assets present. --json: one JSON object per\n"
     "      FILE a line.\n"
     "\n"
+    "  explain [--json] [--offset N] [--depth K] [--kind KIND] FILE\n"
+    "      Shows FILE as the reader reads it, one line per item, indented by\n"
+    "      nesting: the header and the archive's chunks; each record with its\n"
+    "      byte range, record path, kind id, class and version; each value with\n"
+    "      its offset, size, name, encoding, bytes (the first 16) and decoded\n"
+    "      value; the bytes no record reads; and where the reading failed, with\n"
+    "      the rest shown as one undecoded range. --json: the same tree as one\n"
+    "      JSON document. --offset N: only what contains byte N. --depth K: only\n"
+    "      K levels below the file.\n"
+    "\n"
     "Options:\n"
     "  -h, --help   Shows this help.\n"
     "  --version    Shows the version.\n"
@@ -114,9 +124,12 @@ const std::string_view helpText =
     "  check  0 when every FILE reads as binary (and with --strict has no\n"
     "  list   warning); 1 when one does not; 2 for wrong usage or a FILE with an\n"
     "         unknown extension.\n"
+    "  explain  0 when FILE reads as binary; 1 when it does not (the explanation\n"
+    "         shows where) or the output cannot be written; 2 for wrong usage or a\n"
+    "         FILE that cannot be read.\n"
     "\n"
-    "More in 'man dexmor'. From Python: Dexmor.getZelmatXml, Dexmor.getZeloptXml\n"
-    "and Dexmor.diagnose.\n";
+    "More in 'man dexmor'. From Python: Dexmor.getZelmatXml, Dexmor.getZeloptXml,\n"
+    "Dexmor.diagnose and Dexmor.explain.\n";
 
 namespace {
 
@@ -129,6 +142,7 @@ constexpr Command commands[] = {
     {"xml", runXml},
     {"check", runCheck},
     {"list", runList},
+    {"explain", runExplain},
 };
 
 int run(Args args) {

@@ -17,6 +17,7 @@ set(DEXMOR_PUBLIC_HEADERS
   brdfs/ReflectionBRDFs.hpp
   dexmor.hpp
   files/ConversionContext.hpp
+  files/Explanation.hpp
   files/ZelMatFile.hpp
   files/ZelOptFile.hpp
   lights/BaseLight.hpp

@@ -34,7 +34,7 @@ text.
 """
 
 import os
-from typing import List, Literal, Optional, Protocol, Tuple, Union, overload
+from typing import Any, Dict, List, Literal, Optional, Protocol, Tuple, Union, overload
 
 _Path = Union[str, "os.PathLike[str]"]
 _Data = Union[bytes, bytearray, memoryview]
@@ -191,3 +191,18 @@ def diagnoseBytes(data: _Data, /, kind: _Kind) -> Optional[str]:
     """Tells why the bytes of a file would not convert to an XML document: None
     when they read as a binary file of `kind` ("zelmat" or "zelopt"), else the
     reason, as diagnose() gives it."""
+
+def explain(path: _Path, /, *, kind: Optional[_Kind] = None) -> Dict[str, Any]:
+    """Every byte of the file at `path` as its reader reads it: the dict that
+    `dexmor explain --json` prints.
+
+    A node has "offset", "size", "name", "kind" ("file", "header", "archive",
+    "chunk", "record", "group", "field", "unread" or "failure"), "value" (numbers
+    as the XML writes them, text decoded) and "children"; a field also its
+    "encoding" and "hex" bytes, a record its "kind_id", "class" and "version",
+    and any node a "note". The top node adds "path", "file_kind",
+    "reads_as_binary", "failure" (None, or a dict of "reason", "offset" and
+    "record_path") and "cut" (whether the file held more values than an
+    explanation keeps). The kind is the extension's unless kind= says; a file
+    that cannot be opened raises the OSError that open() raises.
+    """

@@ -8,6 +8,7 @@
 //   Dexmor.convertBytes(data, kind, *, strict, max_output, wrap) -> str
 //   Dexmor.convertBytesWithDiagnosis(data, kind, *, max_output) -> (str, str|None)
 //   Dexmor.diagnoseBytes(data, kind) -> str|None
+//   Dexmor.explain(path, *, kind) -> dict   every byte of the file, named
 //   Dexmor.error                      raised when a path has the wrong extension,
 //                                     a document exceeds its budget, or the
 //                                     conversion fails unexpectedly
@@ -559,6 +560,88 @@ PyObject* diagnoseBytes(PyObject*, PyObject* args, PyObject* kwargs) noexcept {
     });
 }
 
+// ---- explain ----------------------------------------------------------------------------
+
+// Sets dict[key] = value, taking the new reference `value`; false with an exception set.
+bool setItem(PyObject* dict, const char* key, PyObject* value) {
+    const Ref held(value);
+    return held && PyDict_SetItemString(dict, key, held.get()) == 0;
+}
+
+// A node as a dict with the keys of `dexmor explain --json`.
+PyObject* nodeDict(const core::ExplainedNode& node) {
+    Ref dict(PyDict_New());
+    if (!dict) return nullptr;
+    PyObject* d = dict.get();
+    if (!setItem(d, "offset", PyLong_FromUnsignedLongLong(node.offset)) ||
+        !setItem(d, "size", PyLong_FromUnsignedLongLong(node.size)) || !setItem(d, "name", lenientText(node.name)) ||
+        !setItem(d, "kind", lenientText(node.kind)) || !setItem(d, "value", lenientText(node.value)))
+        return nullptr;
+    const std::pair<const char*, const std::string*> optionalTexts[] = {
+        {"encoding", &node.encoding}, {"hex", &node.hex},   {"class", &node.className},
+        {"version", &node.version},   {"note", &node.note},
+    };
+    for (const auto& [key, text] : optionalTexts)
+        if (!text->empty() && !setItem(d, key, lenientText(*text))) return nullptr;
+    if (node.kindId && !setItem(d, "kind_id", PyLong_FromLong(*node.kindId))) return nullptr;
+    Ref children(PyList_New(static_cast<Py_ssize_t>(node.children.size())));
+    if (!children) return nullptr;
+    for (std::size_t i = 0; i < node.children.size(); ++i) {
+        PyObject* child = nodeDict(node.children[i]);
+        if (!child) return nullptr;
+        PyList_SET_ITEM(children.get(), static_cast<Py_ssize_t>(i), child);
+    }
+    if (!setItem(d, "children", children.release())) return nullptr;
+    return dict.release();
+}
+
+PyObject* explain(PyObject*, PyObject* args, PyObject* kwargs) noexcept {
+    return guarded([&]() -> PyObject* {
+        static char* names[] = {kPositional, kKind, nullptr};
+        PyObject* path = nullptr;
+        PyObject* kind = Py_None;
+        if (!PyArg_ParseTupleAndKeywords(args, kwargs, "O|$O:explain", names, &path, &kind)) return nullptr;
+        const std::optional<FileArgument> file = fileArgument(path, kind, "explain");
+        if (!file) return nullptr;
+        core::Explanation explanation;
+        withoutInterpreterLock(
+            [&] { explanation = core::explain(file->kind, std::filesystem::path(file->path.path)); });
+        if (!explanation.opened) {
+            core::Diagnosis unopened;
+            unopened.failure = explanation.failure;
+            unopened.openError = explanation.openError;
+            raiseUnopened(unopened, file->path.text.get());
+            return nullptr;
+        }
+        Ref dict(nodeDict(explanation.root));
+        if (!dict) return nullptr;
+        PyObject* d = dict.get();
+        Py_INCREF(file->path.text.get());
+        if (!setItem(d, "path", file->path.text.get()) ||
+            !setItem(d, "file_kind", lenientText(core::extensionOf(file->kind))) ||
+            !setItem(d, "reads_as_binary", PyBool_FromLong(explanation.readsAsBinary)))
+            return nullptr;
+        if (explanation.failure) {
+            Ref failure(PyDict_New());
+            Ref records(PyList_New(0));
+            if (!failure || !records) return nullptr;
+            for (const std::string& level : explanation.failure->recordPath) {
+                const Ref record(lenientText(level));
+                if (!record || PyList_Append(records.get(), record.get()) < 0) return nullptr;
+            }
+            if (!setItem(failure.get(), "reason", lenientText(explanation.failure->reason)) ||
+                !setItem(failure.get(), "offset", PyLong_FromUnsignedLongLong(explanation.failure->offset)) ||
+                !setItem(failure.get(), "record_path", records.release()) || !setItem(d, "failure", failure.release()))
+                return nullptr;
+        } else {
+            Py_INCREF(Py_None);
+            if (!setItem(d, "failure", Py_None)) return nullptr;
+        }
+        if (!setItem(d, "cut", PyBool_FromLong(explanation.cut))) return nullptr;
+        return dict.release();
+    });
+}
+
 template <PyObject* (*Function)(PyObject*, PyObject*, PyObject*) noexcept>
 PyCFunction withKeywords() {
     return reinterpret_cast<PyCFunction>(reinterpret_cast<void (*)()>(Function));
@@ -604,6 +687,13 @@ PyMethodDef methods[] = {
      "diagnoseBytes($module, data, /, kind)\n--\n\n"
      "None when the bytes read as a binary file of kind (\"zelmat\" or \"zelopt\");\n"
      "otherwise why not, as diagnose() says it."},
+    {"explain", withKeywords<explain>(), METH_VARARGS | METH_KEYWORDS,
+     "explain($module, path, /, *, kind=None)\n--\n\n"
+     "Every byte of the file at `path` as its reader reads it, as the dict that\n"
+     "`dexmor explain --json` prints: a tree of nodes with offset, size, name, kind,\n"
+     "value and children (a value's encoding, hex bytes; a record's kind_id, class,\n"
+     "version), and at the top path, file_kind, reads_as_binary, failure and cut.\n"
+     "kind= as for convert(). A file that cannot be opened raises what open() raises."},
     {nullptr, nullptr, 0, nullptr},
 };
 

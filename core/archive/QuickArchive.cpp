@@ -106,7 +106,11 @@ bool QuickArchive::canHold(std::uint64_t count, std::uint64_t itemSize) const {
     return count <= remaining() / itemSize;
 }
 
-void QuickArchive::skip(std::uint64_t bytes) { readPos_ += bytes; }
+void QuickArchive::skip(std::uint64_t bytes) {
+    if (observer_) [[unlikely]]
+        observer_->value(readPos_, bytes, Encoding::Skipped, nullptr);
+    readPos_ += bytes;
+}
 
 QuickArchive::Chunk& QuickArchive::chunkFor(std::uint64_t position) {
     // Positions only ever advance by whole values, so at most one chunk is missing.
@@ -117,13 +121,6 @@ QuickArchive::Chunk& QuickArchive::chunkFor(std::uint64_t position) {
 void QuickArchive::putByte(std::uint8_t b) {
     chunkFor(writePos_)[chunkOffset(writePos_)] = b;
     ++writePos_;
-}
-
-bool QuickArchive::getByte(std::uint8_t& b) {
-    const std::uint64_t position = readPos_++;
-    if (chunkIndex(position) >= chunks_.size()) return false;
-    b = (*chunks_[chunkIndex(position)])[chunkOffset(position)];
-    return true;
 }
 
 void QuickArchive::putRaw(const void* data, std::size_t length) {
@@ -181,12 +178,35 @@ void QuickArchive::write(const Transform& v) {
     write(v.offs);
 }
 
+bool QuickArchive::observedCopy(void* data, std::size_t length, Encoding encoding) {
+    const std::uint64_t start = readPos_;
+    const bool complete = copyOut(data, length);
+    observer_->value(start, length, encoding, data);
+    return complete;
+}
+
+// Reads a compound value while the observer is set aside (its parts are not
+// values of their own), then reports it whole.
+template <class T>
+void QuickArchive::observedCompound(T& v, Encoding encoding) {
+    ReadObserver* const observer = observer_;
+    const std::uint64_t start = readPos_;
+    observer_ = nullptr;
+    read(v);
+    observer_ = observer;
+    observer->value(start, readPos_ - start, encoding, &v);
+}
+
 void QuickArchive::read(bool& v) {
+    if (observer_) [[unlikely]]
+        return observedCompound(v, Encoding::Bool);
     std::uint8_t b = v ? 1 : 0;
-    getByte(b);
+    takeByte(b);
     v = b != 0;
 }
 void QuickArchive::read(Vector& v) {
+    if (observer_) [[unlikely]]
+        return observedCompound(v, Encoding::Vector);
     Vector t{};
     read(t.x);
     read(t.y);
@@ -194,6 +214,8 @@ void QuickArchive::read(Vector& v) {
     v = t;
 }
 void QuickArchive::read(Color& v) {
+    if (observer_) [[unlikely]]
+        return observedCompound(v, Encoding::Color);
     Color t{};
     read(t.r);
     read(t.g);
@@ -201,6 +223,8 @@ void QuickArchive::read(Color& v) {
     v = t;
 }
 void QuickArchive::read(AColor& v) {
+    if (observer_) [[unlikely]]
+        return observedCompound(v, Encoding::AColor);
     AColor t{};
     read(t.r);
     read(t.g);
@@ -209,9 +233,13 @@ void QuickArchive::read(AColor& v) {
     v = t;
 }
 void QuickArchive::read(Matrix& v) {
+    if (observer_) [[unlikely]]
+        return observedCompound(v, Encoding::Matrix);
     for (Vector& column : v.m) read(column);
 }
 void QuickArchive::read(Transform& v) {
+    if (observer_) [[unlikely]]
+        return observedCompound(v, Encoding::Transform);
     read(v.m);
     read(v.offs);
 }
@@ -221,7 +249,33 @@ void QuickArchive::writeString(std::string_view narrow) {
     putRaw(narrow.data(), narrow.size());
 }
 
+bool QuickArchive::observedCounted(std::string& out, Encoding encoding) {
+    ReadObserver* const observer = observer_;
+    const std::uint64_t start = readPos_;
+    observer_ = nullptr;
+    const bool read = encoding == Encoding::WString ? readWString(out) : readString(out);
+    observer_ = observer;
+    if (read) {
+        observer->value(start, readPos_ - start, encoding, &out);
+    } else {
+        reportRefusedCount(start);
+    }
+    return read;
+}
+
+void QuickArchive::reportRefusedCount(std::uint64_t start) {
+    // Only the count was read: it is what the user needs to see.
+    const std::uint64_t end = readPos_;
+    readPos_ = start;
+    std::uint32_t count = 0;
+    copyOut(&count, sizeof count);
+    readPos_ = end;
+    observer_->value(start, end - start, Encoding::UInt32, &count);
+}
+
 bool QuickArchive::readString(std::string& out) {
+    if (observer_) [[unlikely]]
+        return observedCounted(out, Encoding::String);
     const auto length = get<std::uint32_t>();
     if (length == 0) {
         out.clear();
@@ -243,6 +297,8 @@ void QuickArchive::writeWString(std::string_view utf8) {
 }
 
 bool QuickArchive::readWString(std::string& out) {
+    if (observer_) [[unlikely]]
+        return observedCounted(out, Encoding::WString);
     std::string bytes;
     if (!readString(bytes)) return false;
     out = text::decodeStoredText(bytes);
@@ -260,6 +316,18 @@ void QuickArchive::writeBytes(const void* data, std::uint32_t length) {
 // surplus beyond K is skipped. The stored count is returned; callers compare it
 // with the one they expected.
 std::optional<std::uint32_t> QuickArchive::readBytes(void* buffer, std::uint32_t capacity, bool strict) {
+    if (observer_) [[unlikely]] {
+        ReadObserver* const observer = observer_;
+        const std::uint64_t start = readPos_;
+        observer_ = nullptr;
+        const std::optional<std::uint32_t> stored = readBytes(buffer, capacity, strict);
+        observer_ = observer;
+        if (!stored)
+            reportRefusedCount(start);
+        else if (readPos_ != start) // a strict read that went back reported nothing: the next reader reads it
+            observer->value(start, readPos_ - start, Encoding::Bytes, &*stored);
+        return stored;
+    }
     const std::uint64_t start = readPos_;
     const auto length = get<std::uint32_t>();
     if (!canHold(length, 1)) {
@@ -393,6 +461,14 @@ bool QuickArchive::checkVersion(VersionWord version, std::uint16_t latest, std::
 bool QuickArchive::fail(std::string_view reason) {
     if (!failure_) failure_ = ReadFailure{std::string(reason), readPos_, recordPath()};
     return false;
+}
+
+void QuickArchive::Scope::reportEnter(const char* what, const char* name, std::int64_t index) {
+    ar_.observer_->enter(what, name, index, nests_);
+}
+
+void QuickArchive::Scope::reportLeave() {
+    ar_.observer_->leave(pushed_ ? ar_.recordPath().back() : std::string());
 }
 
 void QuickArchive::Scope::tooDeep() {

@@ -6,6 +6,7 @@
 #include <dexmor/platform/Text.hpp>
 
 #include "files/DocumentSurvey.hpp"
+#include "files/Explainer.hpp"
 #include "files/LibraryConversion.hpp"
 #include "files/OptionsConversion.hpp"
 #include "files/SinkWriter.hpp"
@@ -221,6 +222,28 @@ Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink, const C
         result.exceededBudget = exceeded.budget;
     }
     result.opened = true;
+    return result;
+}
+
+Explanation explain(FileKind kind, const Input& input) {
+    Explanation result;
+    FileError error;
+    const std::optional<InputBytes> bytes = bytesOf(input, error);
+    if (!bytes) {
+        result.failure = unopened(std::move(error)).failure;
+        result.openError = error.number;
+        return result;
+    }
+    if (bytes->overLimit) {
+        result.opened = true;
+        result.failure = tooLargeForAnArchive().failure;
+        result.root.kind = "file";
+        return result;
+    }
+    runWithStack(kConversionStack, [&] {
+        ConversionContext context;
+        result = explainBytes(kind, bytes->bytes);
+    });
     return result;
 }
 

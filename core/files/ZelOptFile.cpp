@@ -27,13 +27,14 @@ bool ZelOptFile::readFile(OrvexSerializable& object, const std::filesystem::path
     return readBytes(object, content->bytes.view());
 }
 
-bool ZelOptFile::readBytes(OrvexSerializable& object, std::string_view bytes) {
+bool ZelOptFile::readBytes(OrvexSerializable& object, std::string_view bytes, ReadObserver* observer) {
     lastReadFailure_.reset();
     if (bytes.empty()) {
         lastReadFailure_ = ReadFailure{"the file is empty", 0, {}};
         return false;
     }
     QuickArchive ar(bytes.data(), bytes.size());
+    ar.observe(observer);
     if (!ar.failed() && object.readFromArchive(ar)) return true;
     if (!ar.failed()) ar.fail("the record was rejected");
     lastReadFailure_ = ar.failure();

@@ -217,3 +217,6 @@ Diagnosis convert(FileKind kind, const Input& input, DocumentSink& sink, const C
 Diagnosis diagnose(FileKind kind, const Input& input);
 
 } // namespace OrvexKavorCore
+
+// dexmor explain: every byte of a file, named.
+#include <dexmor/files/Explanation.hpp>

@@ -27,15 +27,19 @@ struct Family;
 template <class Base>
 bool readMember(QuickArchive& ar, boost::shared_ptr<Base>& member, const char* name = nullptr,
                 std::int64_t index = -1) {
+    // The name a new object holds until its record's name is read; it outlives the
+    // scope, whose level shows the name when it closes (to an observer).
+    std::string defaultName;
     QuickArchive::Scope scope(ar, Family<Base>::word, name, index);
     if (!scope) return false;
     const auto kind = ar.get<std::int32_t>();
     boost::shared_ptr<Base> object = Family<Base>::create(kind);
     if (!object) return ar.fail(std::string("unknown ") + Family<Base>::word + " kind " + std::to_string(kind));
+    if (ReadObserver* observer = ar.observer()) [[unlikely]]
+        observer->selected(kind, typeid(*object));
     member = object;
     if constexpr (requires { object->name; }) {
-        // A new object holds its kind's default name until its record's name is read.
-        const std::string defaultName = object->name;
+        defaultName = object->name;
         scope.showName(object->name, defaultName);
         return object->readFromArchive(ar);
     } else {

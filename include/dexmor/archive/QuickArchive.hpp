@@ -27,9 +27,12 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <typeinfo>
 #include <vector>
 
 namespace OrvexKavorCore {
+
+class QuickArchive;
 
 // Two small numbers packed into one UInt32: the first in the low 16 bits, the
 // second in the high 16 bits.
@@ -45,8 +48,51 @@ struct VersionWord {
     friend constexpr bool operator==(VersionWord, VersionWord) = default;
 };
 
+// Watches a reading: every value as the archive delivers it, and the record path
+// as readers open and close its levels (QuickArchive::Scope). An archive without
+// an observer pays one predictable branch per read for this.
+class ReadObserver {
+public:
+    // How a value is stored.
+    enum class Encoding : std::uint8_t {
+        Bool,
+        UInt8,
+        Int32,
+        UInt32,
+        Float32,
+        Float64,
+        Vector,
+        Color,
+        AColor,
+        Matrix,
+        Transform,
+        VersionWord,
+        String,  // value: the std::string as read (up to its first NUL)
+        WString, // value: the decoded std::string
+        Bytes,   // a count-prefixed block; value: the stored count (std::uint32_t)
+        Raw,     // bytes copied as they are; value: the bytes
+        Skipped, // bytes passed over; value: nullptr
+    };
+
+    virtual ~ReadObserver() = default;
+    // A value of `size` bytes read at archive position `position`. `value` points
+    // to the value as read (see Encoding); bytes past the last chunk leave it as
+    // it was. Only valid during the call.
+    virtual void value(std::uint64_t position, std::uint64_t size, Encoding encoding, const void* value) = 0;
+    // A level of the record path opens: a nested member (`nests`: "texture",
+    // "material" 3) or the label of a field of a flat record ("color_tex").
+    virtual void enter(const char* what, const char* name, std::int64_t index, bool nests) = 0;
+    // The level closes; `level` is how a record path shows it now that its record
+    // has been read (`material 3 "Oak"`), empty beyond the nesting limit.
+    virtual void leave(std::string_view level) = 0;
+    // A member's kind id selected an object of this class.
+    virtual void selected(std::int32_t kind, const std::type_info& type) = 0;
+};
+
 class QuickArchive {
 public:
+    using Encoding = ReadObserver::Encoding;
+
     static constexpr std::size_t kChunkSize = 4096;
     static constexpr unsigned kMaxNesting = 256;
     // Positions are 32-bit in the format: archives of 4 GiB or more are refused.
@@ -85,20 +131,18 @@ public:
 
     // --- bytes ---
     void putByte(std::uint8_t b);
-    bool getByte(std::uint8_t& b);
+    bool getByte(std::uint8_t& b) {
+        if (observer_) [[unlikely]]
+            return observedCopy(&b, 1, Encoding::UInt8);
+        return takeByte(b);
+    }
     void putRaw(const void* data, std::size_t length);
     // Reads `length` bytes; bytes past the last chunk leave the destination as it was.
     // True when every byte was delivered.
     bool getRaw(void* data, std::size_t length) {
-        // Most values lie inside one chunk: copy them at once.
-        const std::uint64_t index = readPos_ / kChunkSize;
-        const std::size_t offset = static_cast<std::size_t>(readPos_ % kChunkSize);
-        if (index < chunks_.size() && length <= kChunkSize - offset) {
-            std::memcpy(data, chunks_[index]->data() + offset, length);
-            readPos_ += length;
-            return true;
-        }
-        return getRawAcrossChunks(data, length);
+        if (observer_) [[unlikely]]
+            return observedCopy(data, length, Encoding::Raw);
+        return copyOut(data, length);
     }
 
     // --- primitives (little-endian, packed) ---
@@ -118,17 +162,17 @@ public:
     // A stored Bool byte other than 0 reads as true.
     void read(bool& v);
     void read(std::uint8_t& v) { getByte(v); }
-    void read(std::int32_t& v) { getRaw(&v, sizeof v); }
-    void read(std::uint32_t& v) { getRaw(&v, sizeof v); }
-    void read(float& v) { getRaw(&v, sizeof v); }
-    void read(double& v) { getRaw(&v, sizeof v); }
+    void read(std::int32_t& v) { readPlain(v, Encoding::Int32); }
+    void read(std::uint32_t& v) { readPlain(v, Encoding::UInt32); }
+    void read(float& v) { readPlain(v, Encoding::Float32); }
+    void read(double& v) { readPlain(v, Encoding::Float64); }
     // The compound values assemble into a zeroed temporary: missing bytes read as 0.
     void read(Vector& v);
     void read(Color& v);
     void read(AColor& v);
     void read(Matrix& v);
     void read(Transform& v);
-    void read(VersionWord& v) { read(v.raw); }
+    void read(VersionWord& v) { readPlain(v.raw, Encoding::VersionWord); }
 
     // Reads a value into a fresh zero-initialised local and returns it.
     template <class T>
@@ -174,6 +218,12 @@ public:
     // For readers that deliberately ignore a member's failure.
     void clearFailure() { failure_.reset(); }
 
+    // --- watching a reading ---
+    // Every read value and every level of the record path is reported to
+    // `observer` (nullptr: none) until it is replaced. It must outlive the reading.
+    void observe(ReadObserver* observer) { observer_ = observer; }
+    ReadObserver* observer() const { return observer_; }
+
     // --- record versions ---
     // Every record begins with a version word (0, n). A record reads versions
     // (0, 1) to (0, latest): checkVersion fails the record with "unknown WHAT
@@ -196,7 +246,11 @@ public:
             : Scope(ar, what, name, index, true) {}
         // A label only (a field of a flat record): does not count as nesting.
         static Scope label(QuickArchive& ar, const char* name) { return Scope(ar, nullptr, name, -1, false); }
-        ~Scope() {
+        // Scopes open and close for every field of a record: they stay inline, the
+        // reports to an observer out of line.
+        [[gnu::always_inline]] ~Scope() {
+            if (ar_.observer_) [[unlikely]]
+                reportLeave();
             if (nests_) --ar_.nesting_;
             if (pushed_) ar_.frames_.pop_back();
         }
@@ -212,13 +266,18 @@ public:
         }
 
     private:
-        Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index, bool nests)
+        [[gnu::always_inline]] Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index,
+                                     bool nests)
             : ar_(ar), nests_(nests), pushed_(ar.frames_.size() < kMaxNesting), ok_(true) {
             // The path is kept only up to the limit: deeper frames add nothing a user needs.
             if (pushed_) ar_.frames_.push_back(Frame{what, name, index, {}});
+            if (ar_.observer_) [[unlikely]]
+                reportEnter(what, name, index);
             if (nests_ && ++ar_.nesting_ > kMaxNesting) tooDeep();
         }
         void tooDeep();
+        [[gnu::cold]] void reportEnter(const char* what, const char* name, std::int64_t index);
+        [[gnu::cold]] void reportLeave();
         QuickArchive& ar_;
         bool nests_;
         bool pushed_;
@@ -239,8 +298,40 @@ private:
     };
 
     Chunk& chunkFor(std::uint64_t position);
+    bool copyOut(void* data, std::size_t length) {
+        // Most values lie inside one chunk: copy them at once.
+        const std::uint64_t index = readPos_ / kChunkSize;
+        const std::size_t offset = static_cast<std::size_t>(readPos_ % kChunkSize);
+        if (index < chunks_.size() && length <= kChunkSize - offset) {
+            std::memcpy(data, chunks_[index]->data() + offset, length);
+            readPos_ += length;
+            return true;
+        }
+        return getRawAcrossChunks(data, length);
+    }
+    bool takeByte(std::uint8_t& b) {
+        const std::uint64_t position = readPos_++;
+        if (position / kChunkSize >= chunks_.size()) return false;
+        b = (*chunks_[position / kChunkSize])[position % kChunkSize];
+        return true;
+    }
     bool getRawAcrossChunks(void* data, std::size_t length);
     std::vector<std::string> recordPath() const;
+
+    template <class T>
+    void readPlain(T& v, Encoding encoding) {
+        if (observer_) [[unlikely]] {
+            observedCopy(&v, sizeof v, encoding);
+            return;
+        }
+        copyOut(&v, sizeof v);
+    }
+    // The reads while an observer watches, out of the way of the plain ones.
+    [[gnu::cold]] bool observedCopy(void* data, std::size_t length, Encoding encoding);
+    template <class T>
+    void observedCompound(T& v, Encoding encoding);
+    bool observedCounted(std::string& out, Encoding encoding);
+    void reportRefusedCount(std::uint64_t start);
 
     std::vector<boost::shared_ptr<Chunk>> chunks_;
     std::uint64_t readPos_ = 0;
@@ -248,6 +339,7 @@ private:
     std::vector<Frame> frames_;
     unsigned nesting_ = 0;
     std::optional<ReadFailure> failure_;
+    ReadObserver* observer_ = nullptr;
 };
 
 } // namespace OrvexKavorCore

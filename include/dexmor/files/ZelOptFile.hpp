@@ -24,8 +24,9 @@ public:
     // Loads the object from the file; false for a missing, empty or unreadable file
     // or a record the object rejects.
     virtual bool readFile(OrvexSerializable& object, const std::filesystem::path& path);
-    // The same on the bytes of a file in memory.
-    bool readBytes(OrvexSerializable& object, std::string_view bytes);
+    // The same on the bytes of a file in memory; `observer`, when given, watches
+    // the reading (see ReadObserver).
+    bool readBytes(OrvexSerializable& object, std::string_view bytes, ReadObserver* observer = nullptr);
 
     const std::optional<ReadFailure>& lastReadFailure() const { return lastReadFailure_; }
 
