@@ -81,15 +81,15 @@ bool BaseMaterial::writeBaseRecord(QuickArchive& ar) const {
 
 bool BaseMaterial::readBaseRecord(QuickArchive& ar) {
     const auto version = ar.readVersion(2, "base material record");
-    if (!version || !ar.readWString(name)) return false;
-    if (version->second() == 2 && !ar.readWString(identifier)) return false;
+    if (!version || !ar.readWStringAs("name", name)) return false;
+    if (version->second() == 2 && !ar.readWStringAs("identifier", identifier)) return false;
     if (name.empty()) name = defaultMaterialName();
     return true;
 }
 
 bool BaseMaterial::readNameItem(QuickArchive& ar) {
     std::string stored;
-    if (!ar.readWString(stored)) return false;
+    if (!ar.readWStringAs("name", stored)) return false;
     name = SceneMaterials::instance()->uniqueName(stored.empty() ? kDefaultName : std::string_view(stored));
     return true;
 }

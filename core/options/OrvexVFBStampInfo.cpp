@@ -18,11 +18,12 @@ bool OrvexVFBStampInfo::readFromArchive(QuickArchive& ar) {
     resetToDefaults();
     const auto version = ar.get<VersionWord>();
     if (!ar.checkVersion(version, kVersion, "stamp info")) return false;
-    ar.read(si_i1);
-    ar.read(si_i2);
-    ar.read(si_i3);
+    ar.readAs("si_i1", si_i1);
+    ar.readAs("si_i2", si_i2);
+    ar.readAs("si_i3", si_i3);
     // The stored text replaces the default, also when it is empty.
-    if (!ar.readWString(text)) return false;
+    if (!ar.readWStringAs("text", text)) return false;
+    const auto label = QuickArchive::Scope::label(ar, "si_block");
     if (version.second() == 1) {
         ar.getRaw(si_block.data(), si_block.size());
         return true;

@@ -85,19 +85,19 @@ bool DefAnimTransformParam::readFromArchive(QuickArchive& ar) {
 
     // Version 1 stored the keys directly, without a record of their own.
     if (!ar.readString(name_)) return false;
-    const auto count = ar.get<std::uint32_t>();
+    const auto count = ar.getAs<std::uint32_t>("key count");
     constexpr std::uint64_t kKeySize = 8 + 48;
     const std::uint64_t left = ar.remaining() > 4 ? ar.remaining() - 4 : 0; // after the time size
     if (count > left / kKeySize)
         return ar.fail(std::to_string(count) + " keys do not fit in the " + std::to_string(left) + " bytes left");
-    const auto timeSize = ar.get<std::uint32_t>();
+    const auto timeSize = ar.getAs<std::uint32_t>("key time size");
     if (timeSize != 8) return ar.fail("animated transform key times of " + std::to_string(timeSize) + " bytes");
     std::vector<AnimatedTransform::Key> keys;
     keys.reserve(count);
     for (std::uint32_t i = 0; i < count; ++i) {
-        const auto time = ar.get<double>();
+        const auto time = ar.getAs<double>("key time");
         if (std::isnan(time)) return ar.fail("animated transform key time that is not a number");
-        keys.push_back({time, ar.get<Transform>()});
+        keys.push_back({time, ar.getAs<Transform>("key value")});
     }
     value_.setValues(std::move(keys));
     return true;

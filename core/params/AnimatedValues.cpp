@@ -157,17 +157,17 @@ bool AnimatedValue<T>::readFromArchive(QuickArchive& ar) {
     const auto version = ar.get<VersionWord>();
     resetToDefaults();
     if (!version.is(0, 1)) return ar.fail(std::string("unknown ") + Traits::kWhat + " version");
-    const auto count = ar.get<std::uint32_t>();
+    const auto count = ar.getAs<std::uint32_t>("key count");
     // The keys follow the time size (and the blending flag).
     constexpr std::uint64_t kBeforeKeys = 4 + (Traits::kStoresInterpolate ? 1 : 0);
     const std::uint64_t left = ar.remaining() > kBeforeKeys ? ar.remaining() - kBeforeKeys : 0;
     if (count > left / (kTimeSize + Traits::kStoredSize))
         return ar.fail(std::to_string(count) + " keys do not fit in the " + std::to_string(left) + " bytes left");
-    const auto timeSize = ar.get<std::uint32_t>();
+    const auto timeSize = ar.getAs<std::uint32_t>("key time size");
     if (timeSize != kTimeSize)
         return ar.fail(std::string(Traits::kWhat) + " key times of " + std::to_string(timeSize) + " bytes");
     if constexpr (Traits::kStoresInterpolate)
-        ar.read(interpolate_);
+        ar.readAs("interpolate", interpolate_);
     else
         removeAllKeys();
     // Set all at once: one by one, keys stored in descending time would take
@@ -175,9 +175,9 @@ bool AnimatedValue<T>::readFromArchive(QuickArchive& ar) {
     std::vector<Key> stored;
     stored.reserve(count);
     for (std::uint32_t i = 0; i < count; ++i) {
-        const auto time = ar.get<double>();
+        const auto time = ar.getAs<double>("key time");
         if (std::isnan(time)) return ar.fail(std::string(Traits::kWhat) + " key time that is not a number");
-        stored.push_back(Key{time, ar.get<T>()});
+        stored.push_back(Key{time, ar.getAs<T>("key value")});
     }
     setValues(std::move(stored));
     return true;

@@ -4,6 +4,7 @@
 #include <dexmor/xml/AssetXmlWriter.hpp>
 
 #include <array>
+#include <utility>
 
 #include <cmath>
 
@@ -76,10 +77,15 @@ bool TransformComponents::readFromArchive(QuickArchive& ar) {
     resetToDefaults();
     const auto version = ar.get<VersionWord>();
     if (!version.is(0, 1)) return ar.fail("unknown transform components version");
-    for (float* v : {&x_rotation, &y_rotation, &z_rotation, &x_scale, &y_scale, &z_scale, &x_offset, &y_offset,
-                     &z_offset})
-        ar.read(*v);
-    for (std::int32_t* v : {&x_mirror, &y_mirror, &z_mirror}) ar.read(*v);
+    const std::pair<const char*, float*> numbers[] = {
+        {"x_rotation", &x_rotation}, {"y_rotation", &y_rotation}, {"z_rotation", &z_rotation},
+        {"x_scale", &x_scale},       {"y_scale", &y_scale},       {"z_scale", &z_scale},
+        {"x_offset", &x_offset},     {"y_offset", &y_offset},     {"z_offset", &z_offset},
+    };
+    for (const auto& [name, v] : numbers) ar.readAs(name, *v);
+    const std::pair<const char*, std::int32_t*> mirrors[] = {
+        {"x_mirror", &x_mirror}, {"y_mirror", &y_mirror}, {"z_mirror", &z_mirror}};
+    for (const auto& [name, v] : mirrors) ar.readAs(name, *v);
     return true;
 }
 

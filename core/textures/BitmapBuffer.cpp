@@ -35,10 +35,10 @@ bool BitmapBuffer::writeToArchive(QuickArchive& ar) {
 
 bool BitmapBuffer::readFromArchive(QuickArchive& ar) {
     if (!ar.readVersion(kVersion.second(), "bitmap buffer")) return false;
-    ar.read(filter_type);
-    ar.read(filter_blur);
-    ar.read(gamma);
-    return ar.readWString(file);
+    ar.readAs("filter_type", filter_type);
+    ar.readAs("filter_blur", filter_blur);
+    ar.readAs("gamma", gamma);
+    return ar.readWStringAs("file", file);
 }
 
 void BitmapBuffer::resetToDefaults() { *this = BitmapBuffer{}; }

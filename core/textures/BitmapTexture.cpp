@@ -45,16 +45,18 @@ bool BitmapTexture::readFromArchive(QuickArchive& ar) {
     const auto version = startRead(ar);
     if (!version) return false;
     // Each kind id is checked as soon as it is read, so a failure points at it.
-    const auto uvwKind = ar.get<std::int32_t>();
+    std::int32_t uvwKind = 0;
+    ar.readAs("uvwgen kind id", uvwKind);
     const UVWPtr newUvwgen = createUVW(uvwKind);
     if (!newUvwgen) return ar.fail("unknown UVW generator kind " + std::to_string(uvwKind) + " of the uvwgen");
-    const auto bitmapKind = ar.get<std::int32_t>();
+    std::int32_t bitmapKind = 0;
+    ar.readAs("bitmap kind id", bitmapKind);
     const BitmapPtr newBitmap = createBitmap(bitmapKind);
     if (!newBitmap) return ar.fail("unknown bitmap kind " + std::to_string(bitmapKind) + " of the bitmap");
     uvwgen = newUvwgen;
     bitmap = newBitmap;
     if (!readCreated(ar, uvwgen, "uvwgen") || !readCreated(ar, bitmap, "bitmap")) return false;
-    ar.read(tile);
+    ar.readAs("tile", tile);
     return true;
 }
 

@@ -107,7 +107,7 @@ bool SkyTexture::readFromArchive(QuickArchive& ar) {
     const unsigned v = *version;
 
     // The sky's own sun. Its failure is not the sky's: the record goes on after it.
-    if (ar.get<bool>()) {
+    if (ar.getAs<bool>("sun present")) {
         QuickArchive::Scope scope(ar, "light", "sun");
         if (!scope) return false;
         auto own = boost::make_shared<SunLight>();
@@ -125,7 +125,7 @@ bool SkyTexture::readFromArchive(QuickArchive& ar) {
         QuickArchive::Scope scope(ar, "light", "default sun");
         if (!scope || !defaultSun->readFromArchive(ar)) return false;
     }
-    if (ar.get<bool>()) sun = defaultSun;
+    if (ar.getAs<bool>("uses default sun")) sun = defaultSun;
     return true;
 }
 

@@ -37,7 +37,7 @@ bool GenProjectionUVW::writeToArchive(QuickArchive& ar) {
 
 bool GenProjectionUVW::readFromArchive(QuickArchive& ar) {
     if (!ar.readVersion(1, "projection UVW generator")) return false;
-    ar.read(uvwTransform);
+    ar.readAs("uvw_transform", uvwTransform);
     return readComponents(ar, uvwComponents, "uvwComponents");
 }
 
@@ -90,13 +90,13 @@ bool GenEnvironmentUVW::writeToArchive(QuickArchive& ar) {
 bool GenEnvironmentUVW::readFromArchive(QuickArchive& ar) {
     const auto version = ar.readVersion(2, "environment UVW generator");
     if (!version) return false;
-    ar.read(uvwMatrix);
-    ar.read(mappingType);
+    ar.readAs("uvw_matrix", uvwMatrix);
+    ar.readAs("mapping_type", mappingType);
     if (version->second() == 2) return readComponents(ar, uvwComponents, "uvwComponents");
-    ar.read(uvwComponents.z_rotation);
-    ar.read(uvwComponents.x_rotation);
-    ar.read(uvwComponents.z_mirror);
-    ar.read(uvwComponents.x_mirror);
+    ar.readAs("z_rotation", uvwComponents.z_rotation);
+    ar.readAs("x_rotation", uvwComponents.x_rotation);
+    ar.readAs("z_mirror", uvwComponents.z_mirror);
+    ar.readAs("x_mirror", uvwComponents.x_mirror);
     return true;
 }
 
@@ -138,17 +138,17 @@ bool GenChannelUVW::writeToArchive(QuickArchive& ar) {
 bool GenChannelUVW::readFromArchive(QuickArchive& ar) {
     const auto version = ar.readVersion(2, "channel UVW generator");
     if (!version) return false;
-    ar.read(uvwTransform);
-    ar.read(texTransform);
+    ar.readAs("uvw_transform", uvwTransform);
+    ar.readAs("tex_transform", texTransform);
     if (version->second() == 1) {
-        ar.read(texComponents.x_rotation);
-        ar.read(texComponents.y_rotation);
-        ar.read(texComponents.x_mirror);
-        ar.read(texComponents.y_mirror);
+        ar.readAs("x_rotation", texComponents.x_rotation);
+        ar.readAs("y_rotation", texComponents.y_rotation);
+        ar.readAs("x_mirror", texComponents.x_mirror);
+        ar.readAs("y_mirror", texComponents.y_mirror);
     }
-    ar.read(wrap_u);
-    ar.read(wrap_v);
-    ar.read(uvw_channel);
+    ar.readAs("wrap_u", wrap_u);
+    ar.readAs("wrap_v", wrap_v);
+    ar.readAs("uvw_channel", uvw_channel);
     if (version->second() == 1) return true;
     return readComponents(ar, uvwComponents, "uvwComponents") && readComponents(ar, texComponents, "texComponents");
 }

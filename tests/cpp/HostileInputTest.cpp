@@ -311,7 +311,7 @@ std::vector<Damaged> damagedRecords() {
     add("frame data", withWord(set, frameData, kBadVersion), readOptions, "frameData", frameData + 4,
         "unknown frame data version (0, 99)");
     const std::size_t stampInfo = frameData + recordOf(options.frameData).size();
-    add("stamp info", withWord(set, stampInfo + 16, kHuge), readOptions, "stampInfo", stampInfo + 20,
+    add("stamp info", withWord(set, stampInfo + 16, kHuge), readOptions, "stampInfo / text", stampInfo + 20,
         "a string of 4000000000 bytes"); // after the version and three integers
     const std::size_t camera = stampInfo + recordOf(options.stampInfo).size();
     add("camera", withWord(set, camera, kBadVersion), readOptions, "camera", camera + 4,

@@ -51,7 +51,9 @@ bool readMember(QuickArchive& ar, boost::shared_ptr<Base>& member, const char* n
 // An absent member leaves `member` empty.
 template <class Base>
 bool readOptionalMember(QuickArchive& ar, boost::shared_ptr<Base>& member, const char* name = nullptr) {
-    if (!ar.get<bool>()) {
+    bool present = false;
+    ar.readAs("present", present);
+    if (!present) {
         member.reset();
         return true;
     }

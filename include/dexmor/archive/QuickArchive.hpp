@@ -236,6 +236,18 @@ public:
         return version;
     }
 
+    // A value read under a field's name, as record tables name theirs: for
+    // failure reports and explanations of hand-written records.
+    template <class T>
+    void readAs(const char* name, T& value);
+    template <class T>
+    T getAs(const char* name) {
+        T value{};
+        readAs(name, value);
+        return value;
+    }
+    bool readWStringAs(const char* name, std::string& value);
+
     // One level of the record path, and the nesting guard. A reader opens a Scope
     // before reading a nested member; when the nesting is too deep the scope is
     // false and the failure is recorded.
@@ -341,5 +353,19 @@ private:
     std::optional<ReadFailure> failure_;
     ReadObserver* observer_ = nullptr;
 };
+
+template <class T>
+void QuickArchive::readAs(const char* name, T& value) {
+    // A plain value cannot fail: only an explanation needs its name.
+    if (!observer_) [[likely]]
+        return read(value);
+    const auto label = Scope::label(*this, name);
+    read(value);
+}
+
+inline bool QuickArchive::readWStringAs(const char* name, std::string& value) {
+    const auto label = Scope::label(*this, name);
+    return readWString(value);
+}
 
 } // namespace OrvexKavorCore
