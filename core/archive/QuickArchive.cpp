@@ -92,7 +92,7 @@ void QuickArchive::reset() {
     chunks_.clear();
     readPos_ = 0;
     writePos_ = 0;
-    frames_.clear();
+    depth_ = 0;
     failure_.reset();
 }
 
@@ -196,14 +196,8 @@ void QuickArchive::observedCompound(T& v, Encoding encoding) {
     observer_ = observer;
     observer->value(start, readPos_ - start, encoding, &v);
 }
+template void QuickArchive::observedCompound(bool&, Encoding); // for read(bool&), inline
 
-void QuickArchive::read(bool& v) {
-    if (observer_) [[unlikely]]
-        return observedCompound(v, Encoding::Bool);
-    std::uint8_t b = v ? 1 : 0;
-    takeByte(b);
-    v = b != 0;
-}
 void QuickArchive::read(Vector& v) {
     if (observer_) [[unlikely]]
         return observedCompound(v, Encoding::Vector);
@@ -428,10 +422,10 @@ std::vector<std::string> QuickArchive::recordPath() const {
         level += text;
     };
     const char* heldLabel = nullptr;
-    for (std::size_t i = 0; i < frames_.size(); ++i) {
+    for (std::size_t i = 0; i < depth_; ++i) {
         const Frame& frame = frames_[i];
         const bool isLabel = !frame.what && frame.index < 0;
-        if (isLabel && i + 1 < frames_.size()) {
+        if (isLabel && i + 1 < depth_) {
             const Frame& member = frames_[i + 1];
             const bool memberNamed = member.name || member.liveName.isRead();
             if (member.what && member.index < 0 && !memberNamed) {
@@ -452,8 +446,7 @@ std::vector<std::string> QuickArchive::recordPath() const {
     return levels;
 }
 
-bool QuickArchive::checkVersion(VersionWord version, std::uint16_t latest, std::string_view what) {
-    if (version.first() == 0 && version.second() >= 1 && version.second() <= latest) return true;
+bool QuickArchive::refuseVersion(VersionWord version, std::string_view what) {
     return fail("unknown " + std::string(what) + " version (" + std::to_string(version.first()) + ", " +
                 std::to_string(version.second()) + ")");
 }
@@ -463,8 +456,10 @@ bool QuickArchive::fail(std::string_view reason) {
     return false;
 }
 
-void QuickArchive::Scope::reportEnter(const char* what, const char* name, std::int64_t index) {
+void QuickArchive::Scope::reportEnter(const char* what, const char* name, std::int64_t index,
+                                      std::uint16_t heldSince, std::uint16_t heldUntil) {
     ar_.observer_->enter(what, name, index, nests_);
+    if (heldSince != 0 || heldUntil != 0xFFFF) ar_.observer_->held(heldSince, heldUntil);
 }
 
 void QuickArchive::Scope::reportLeave() {

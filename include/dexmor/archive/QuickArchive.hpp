@@ -19,6 +19,7 @@
 #include <boost/array.hpp>
 #include <boost/shared_ptr.hpp>
 
+#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -87,6 +88,13 @@ public:
     virtual void leave(std::string_view level) = 0;
     // A member's kind id selected an object of this class.
     virtual void selected(std::int32_t kind, const std::type_info& type) = 0;
+    // The level just opened is a row of a record table that only records of
+    // versions `since` to `until` (inclusive; 0xFFFF: every later one) hold.
+    // Not called for rows that every version holds.
+    virtual void held(std::uint16_t since, std::uint16_t until) {
+        (void)since;
+        (void)until;
+    }
 };
 
 class QuickArchive {
@@ -160,7 +168,13 @@ public:
     void write(VersionWord v) { write(v.raw); }
 
     // A stored Bool byte other than 0 reads as true.
-    void read(bool& v);
+    void read(bool& v) {
+        if (observer_) [[unlikely]]
+            return observedCompound(v, Encoding::Bool);
+        std::uint8_t b = v ? 1 : 0;
+        takeByte(b);
+        v = b != 0;
+    }
     void read(std::uint8_t& v) { getByte(v); }
     void read(std::int32_t& v) { readPlain(v, Encoding::Int32); }
     void read(std::uint32_t& v) { readPlain(v, Encoding::UInt32); }
@@ -229,7 +243,11 @@ public:
     // (0, 1) to (0, latest): checkVersion fails the record with "unknown WHAT
     // version (a, b)" for any other and returns whether it accepts `version`;
     // readVersion reads the word and checks it (nullopt once refused).
-    bool checkVersion(VersionWord version, std::uint16_t latest, std::string_view what);
+    bool checkVersion(VersionWord version, std::uint16_t latest, std::string_view what) {
+        if (version.first() == 0 && version.second() >= 1 && version.second() <= latest) [[likely]]
+            return true;
+        return refuseVersion(version, what);
+    }
     std::optional<VersionWord> readVersion(std::uint16_t latest, std::string_view what) {
         const auto version = get<VersionWord>();
         if (!checkVersion(version, latest, what)) return std::nullopt;
@@ -239,9 +257,14 @@ public:
     // A value read under a field's name, as record tables name theirs: for
     // failure reports and explanations of hand-written records.
     template <class T>
-    void readAs(const char* name, T& value);
+    [[gnu::always_inline]] void readAs(const char* name, T& value) {
+        // A plain value cannot fail: only an explanation needs its name.
+        if (observer_) [[unlikely]]
+            return observedAs(name, value);
+        read(value);
+    }
     template <class T>
-    T getAs(const char* name) {
+    [[gnu::always_inline]] T getAs(const char* name) {
         T value{};
         readAs(name, value);
         return value;
@@ -257,14 +280,22 @@ public:
         Scope(QuickArchive& ar, const char* what, const char* name = nullptr, std::int64_t index = -1)
             : Scope(ar, what, name, index, true) {}
         // A label only (a field of a flat record): does not count as nesting.
-        static Scope label(QuickArchive& ar, const char* name) { return Scope(ar, nullptr, name, -1, false); }
+        [[gnu::always_inline]] static Scope label(QuickArchive& ar, const char* name) {
+            return Scope(ar, nullptr, name, -1, false);
+        }
+        // The label of a record table's row that only record versions `since` to
+        // `until` hold (an observer is told which).
+        [[gnu::always_inline]] static Scope row(QuickArchive& ar, const char* name, std::uint16_t since,
+                                                std::uint16_t until) {
+            return Scope(ar, nullptr, name, -1, false, since, until);
+        }
         // Scopes open and close for every field of a record: they stay inline, the
         // reports to an observer out of line.
         [[gnu::always_inline]] ~Scope() {
             if (ar_.observer_) [[unlikely]]
                 reportLeave();
             if (nests_) --ar_.nesting_;
-            if (pushed_) ar_.frames_.pop_back();
+            if (pushed_) --ar_.depth_;
         }
         Scope(const Scope&) = delete;
         Scope& operator=(const Scope&) = delete;
@@ -274,21 +305,22 @@ public:
         // equals `unread`, the value it had before its record was read. Both must
         // outlive the scope.
         void showName(const std::string& name, const std::string& unread) {
-            if (pushed_) ar_.frames_.back().liveName = LiveName{&name, &unread};
+            if (pushed_) ar_.frames_[ar_.depth_ - 1].liveName = LiveName{&name, &unread};
         }
 
     private:
         [[gnu::always_inline]] Scope(QuickArchive& ar, const char* what, const char* name, std::int64_t index,
-                                     bool nests)
-            : ar_(ar), nests_(nests), pushed_(ar.frames_.size() < kMaxNesting), ok_(true) {
+                                     bool nests, std::uint16_t heldSince = 0, std::uint16_t heldUntil = 0xFFFF)
+            : ar_(ar), nests_(nests), pushed_(ar.depth_ < kMaxNesting), ok_(true) {
             // The path is kept only up to the limit: deeper frames add nothing a user needs.
-            if (pushed_) ar_.frames_.push_back(Frame{what, name, index, {}});
+            if (pushed_) ar_.frames_[ar_.depth_++] = Frame{what, name, index, {}};
             if (ar_.observer_) [[unlikely]]
-                reportEnter(what, name, index);
+                reportEnter(what, name, index, heldSince, heldUntil);
             if (nests_ && ++ar_.nesting_ > kMaxNesting) tooDeep();
         }
         void tooDeep();
-        [[gnu::cold]] void reportEnter(const char* what, const char* name, std::int64_t index);
+        [[gnu::cold]] void reportEnter(const char* what, const char* name, std::int64_t index,
+                                       std::uint16_t heldSince, std::uint16_t heldUntil);
         [[gnu::cold]] void reportLeave();
         QuickArchive& ar_;
         bool nests_;
@@ -298,8 +330,8 @@ public:
 
 private:
     struct LiveName {
-        const std::string* name = nullptr;
-        const std::string* unread = nullptr;
+        const std::string* name;
+        const std::string* unread;
         bool isRead() const { return name && *name != *unread; }
     };
     struct Frame {
@@ -343,22 +375,24 @@ private:
     template <class T>
     void observedCompound(T& v, Encoding encoding);
     bool observedCounted(std::string& out, Encoding encoding);
+    template <class T>
+    [[gnu::noinline, gnu::cold]] void observedAs(const char* name, T& value);
+    [[gnu::cold]] bool refuseVersion(VersionWord version, std::string_view what);
     void reportRefusedCount(std::uint64_t start);
 
     std::vector<boost::shared_ptr<Chunk>> chunks_;
     std::uint64_t readPos_ = 0;
     std::uint64_t writePos_ = 0;
-    std::vector<Frame> frames_;
+    // The open levels are frames_[0, depth_): opening one is a store.
+    std::array<Frame, kMaxNesting> frames_;
+    unsigned depth_ = 0;
     unsigned nesting_ = 0;
     std::optional<ReadFailure> failure_;
     ReadObserver* observer_ = nullptr;
 };
 
 template <class T>
-void QuickArchive::readAs(const char* name, T& value) {
-    // A plain value cannot fail: only an explanation needs its name.
-    if (!observer_) [[likely]]
-        return read(value);
+void QuickArchive::observedAs(const char* name, T& value) {
     const auto label = Scope::label(*this, name);
     read(value);
 }

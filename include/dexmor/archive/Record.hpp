@@ -135,7 +135,7 @@ template <class Obj, class Fields>
 bool readFields(QuickArchive& ar, Obj& object, const Fields& fields, unsigned version) {
     for (const Field<Obj>& f : fields) {
         if (!f.versions.holds(version)) continue;
-        auto scope = QuickArchive::Scope::label(ar, f.name);
+        auto scope = QuickArchive::Scope::row(ar, f.name, f.versions.since, f.versions.until);
         if (!f.read(ar, object)) return false;
     }
     return true;
