@@ -31,6 +31,8 @@ Json jsonOf(const core::ExplainedNode& node) {
     if (node.kindId) json["kind_id"] = *node.kindId;
     if (!node.className.empty()) json["class"] = node.className;
     if (!node.version.empty()) json["version"] = node.version;
+    if (node.heldSince) json["held_since"] = *node.heldSince;
+    if (node.heldUntil) json["held_until"] = *node.heldUntil;
     if (!node.note.empty()) json["note"] = node.note;
     Json children = Json::array();
     for (const core::ExplainedNode& child : node.children) children.push_back(jsonOf(child));

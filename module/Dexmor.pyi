@@ -200,7 +200,8 @@ def explain(path: _Path, /, *, kind: Optional[_Kind] = None) -> Dict[str, Any]:
     "chunk", "record", "group", "field", "unread" or "failure"), "value" (numbers
     as the XML writes them, text decoded) and "children"; a field also its
     "encoding" and "hex" bytes, a record its "kind_id", "class" and "version",
-    and any node a "note". The top node adds "path", "file_kind",
+    a row that only some record versions hold its "held_since" (and
+    "held_until" when later versions dropped it), and any node a "note". The top node adds "path", "file_kind",
     "reads_as_binary", "failure" (None, or a dict of "reason", "offset" and
     "record_path") and "cut" (whether the file held more values than an
     explanation keeps). The kind is the extension's unless kind= says; a file

@@ -584,6 +584,8 @@ PyObject* nodeDict(const core::ExplainedNode& node) {
     for (const auto& [key, text] : optionalTexts)
         if (!text->empty() && !setItem(d, key, lenientText(*text))) return nullptr;
     if (node.kindId && !setItem(d, "kind_id", PyLong_FromLong(*node.kindId))) return nullptr;
+    if (node.heldSince && !setItem(d, "held_since", PyLong_FromLong(*node.heldSince))) return nullptr;
+    if (node.heldUntil && !setItem(d, "held_until", PyLong_FromLong(*node.heldUntil))) return nullptr;
     Ref children(PyList_New(static_cast<Py_ssize_t>(node.children.size())));
     if (!children) return nullptr;
     for (std::size_t i = 0; i < node.children.size(); ++i) {

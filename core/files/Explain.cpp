@@ -8,6 +8,7 @@
 // chunk's end.
 #include "files/Explainer.hpp"
 
+#include <dexmor/archive/Record.hpp>
 #include <dexmor/files/ZelMatFile.hpp>
 #include <dexmor/files/ZelOptFile.hpp>
 #include <dexmor/options/AllOptions.hpp>
@@ -267,6 +268,8 @@ void TreeBuilder::leave(std::string_view level) {
     if (node.children.size() == 1 && node.children.front().isLeaf()) {
         ExplainedNode leaf = std::move(node.children.front());
         leaf.name = std::move(node.name);
+        leaf.heldSince = node.heldSince;
+        leaf.heldUntil = node.heldUntil;
         node = std::move(leaf);
         return;
     }
@@ -283,9 +286,20 @@ void TreeBuilder::leave(std::string_view level) {
     } else if (first.encoding == "UInt32") {
         first.name = "count";
         node.value = first.value + (first.value == "1" ? " item" : " items");
+        // The items of a list of plain values are named by their place.
+        std::size_t item = 0;
+        for (ExplainedNode& child : node.children)
+            if (child.isLeaf() && child.name.empty()) child.name = "item " + std::to_string(item++);
     } else if (first.encoding == "Bool" && node.children.size() == 2 && node.children.back().kind == "record") {
         first.name = "present";
     }
+}
+
+void TreeBuilder::held(std::uint16_t since, std::uint16_t until) {
+    if (open_.empty() || !open_.back().node) return;
+    ExplainedNode& row = *open_.back().node;
+    row.heldSince = since;
+    if (until != record::always().until) row.heldUntil = until;
 }
 
 void TreeBuilder::selected(std::int32_t kind, const std::type_info& type) {
@@ -615,6 +629,14 @@ void keep(const ExplainedNode& from, ExplainedNode& to, const ExplainView& view,
     }
 }
 
+// Which record versions hold a table row: "from version 5", "versions 1 to 20".
+std::string heldText(const ExplainedNode& node) {
+    const std::string since = std::to_string(*node.heldSince);
+    if (!node.heldUntil) return "from version " + since;
+    if (*node.heldUntil == *node.heldSince) return "version " + since + " only";
+    return "versions " + since + " to " + std::to_string(*node.heldUntil);
+}
+
 void appendLine(std::string& out, const ExplainedNode& node, unsigned depth) {
     out.append(std::size_t{2} * depth, ' ');
     const std::string end = std::to_string(node.end());
@@ -633,6 +655,7 @@ void appendLine(std::string& out, const ExplainedNode& node, unsigned depth) {
             out += ": " + node.encoding;
             if (!node.hex.empty()) out += " [" + node.hex + "]";
             if (!node.value.empty()) out += " = " + node.value;
+            if (node.heldSince) out += " (" + heldText(node) + ")";
         }
     } else {
         out += std::to_string(node.offset) + ".." + end + " " + node.name;
@@ -641,6 +664,7 @@ void appendLine(std::string& out, const ExplainedNode& node, unsigned depth) {
         if (node.kindId) fact("kind " + std::to_string(*node.kindId));
         if (!node.className.empty()) fact(node.className);
         if (!node.version.empty()) fact("version " + node.version);
+        if (node.heldSince) fact(heldText(node));
         if (!facts.empty()) out += " (" + facts + ")";
         if (!node.value.empty()) out += " = " + node.value;
     }

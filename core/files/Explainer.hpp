@@ -36,6 +36,7 @@ public:
     void enter(const char* what, const char* name, std::int64_t index, bool nests) override;
     void leave(std::string_view level) override;
     void selected(std::int32_t kind, const std::type_info& type) override;
+    void held(std::uint16_t since, std::uint16_t until) override;
 
     // A value the container holds at a file offset.
     void leafAt(ExplainedNode& parent, std::uint64_t offset, std::uint64_t size, Encoding encoding,

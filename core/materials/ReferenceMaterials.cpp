@@ -65,10 +65,10 @@ bool MaterialLinked::IdData::writeToArchive(QuickArchive& ar) {
 
 bool MaterialLinked::IdData::readFromArchive(QuickArchive& ar) {
     if (!ar.readVersion(1, "link identifier")) return false;
-    tag_ = static_cast<std::int32_t>(ar.get<std::uint32_t>());
-    if (tag_ == 0 || tag_ == kTextTag) return ar.readWString(text_);
+    tag_ = static_cast<std::int32_t>(ar.getAs<std::uint32_t>("tag"));
+    if (tag_ == 0 || tag_ == kTextTag) return ar.readWStringAs("text", text_);
     if (tag_ == kIntegerTag) {
-        ar.read(integer_);
+        ar.readAs("integer", integer_);
         return true;
     }
     return ar.fail("unknown link identifier tag " + std::to_string(static_cast<std::uint32_t>(tag_)));

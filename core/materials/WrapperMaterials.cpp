@@ -171,12 +171,12 @@ bool MaterialBump::readVersion(QuickArchive& ar, unsigned version) {
             if (!ar.readWString(path)) return false;
         }
         bumpTex = makeBitmapTexture(path);
-        ar.read(bumpTexMult);
+        ar.readAs("bump_tex_mult", bumpTexMult);
         return readMember(ar, baseMtl, "base_mtl");
     }
     if (version == 2) {
-        if (!ar.readWString(name)) return false;
-        ar.read(bumpTexMult);
+        if (!ar.readWStringAs("name", name)) return false;
+        ar.readAs("bump_tex_mult", bumpTexMult);
         return readOptionalMember(ar, bumpTex, "bump_tex") && readMember(ar, baseMtl, "base_mtl");
     }
     return record::readFields(ar, *this, fields(), version);

@@ -21,10 +21,10 @@ using namespace record::enc;
 // A box as its four corners, Int32 x0, y0, x1, y1.
 struct Box {
     static bool read(QuickArchive& ar, IntBox& box) {
-        ar.read(box.x0);
-        ar.read(box.y0);
-        ar.read(box.x1);
-        ar.read(box.y1);
+        ar.readAs("x0", box.x0);
+        ar.readAs("y0", box.y0);
+        ar.readAs("x1", box.x1);
+        ar.readAs("y1", box.y1);
         return true;
     }
     static bool write(QuickArchive& ar, const IntBox& box) {

@@ -49,13 +49,13 @@ bool GeomMapChannel::readFromArchive(QuickArchive& ar) {
     faces_ = nullptr;
     tverts_ = nullptr;
     tracker_.clear();
-    channel_ = ar.get<std::int32_t>();
-    if (ar.get<bool>()) {
+    channel_ = ar.getAs<std::int32_t>("channel");
+    if (ar.getAs<bool>("faces present")) {
         auto scope = QuickArchive::Scope::label(ar, kFacesName);
         faces_ = newFaces();
         if (!faces_->readFromArchive(ar)) return false;
     }
-    if (ar.get<bool>()) {
+    if (ar.getAs<bool>("tverts present")) {
         auto scope = QuickArchive::Scope::label(ar, kTvertsName);
         tverts_ = newTverts();
         if (!tverts_->readFromArchive(ar)) return false;

@@ -39,7 +39,7 @@ bool readList(QuickArchive& ar, std::vector<T>& values, std::string& name, const
     if (static_cast<std::uint64_t>(count) * sizeof(T) + 8 > ar.remaining())
         return ar.fail(std::string(what) + " of " + std::to_string(count) + " elements does not fit in the " +
                        std::to_string(ar.remaining()) + " bytes left");
-    const auto elementSize = ar.get<std::uint32_t>();
+    const auto elementSize = ar.getAs<std::uint32_t>("element size");
     if (elementSize != sizeof(T))
         return ar.fail(std::string(what) + " elements of " + std::to_string(elementSize) + " bytes, expected " +
                        std::to_string(sizeof(T)));

@@ -119,10 +119,10 @@ bool BlendTexture::readFromArchive(QuickArchive& ar) {
     if (!version) return false;
     const bool withFactors = *version >= 2;
     if (!readOptionalMember(ar, color_a, "color_a")) return false;
-    if (withFactors && color_a) ar.read(colorAFactor);
+    if (withFactors && color_a) ar.readAs("colorAFactor", colorAFactor);
     if (!readOptionalMember(ar, color_b, "color_b")) return false;
-    if (withFactors && color_b) ar.read(colorBFactor);
-    ar.read(blend_amount);
+    if (withFactors && color_b) ar.readAs("colorBFactor", colorBFactor);
+    ar.readAs("blend_amount", blend_amount);
     return true;
 }
 

@@ -36,6 +36,10 @@ struct ExplainedNode {
     std::optional<std::int32_t> kindId; // a record's kind id
     std::string className;              // the class that kind id selects
     std::string version;                // a record's version word: "(0, 3)"
+    // A row of a record table that only some record versions hold: the first
+    // and (when there is one) the last of them.
+    std::optional<std::uint16_t> heldSince;
+    std::optional<std::uint16_t> heldUntil;
     std::vector<ExplainedNode> children;
 
     bool isLeaf() const { return kind == "field" || kind == "unread"; }
