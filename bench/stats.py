@@ -256,8 +256,13 @@ def report(results):
                       f" {(f'{rate / MB:.0f} MB/s') if rate else '':>12}")
             # The streamed conversion in one process: the time per material without
             # the start of a process in it.
-            per_material = {int(b["name"].split("/")[1]): b["per_material"]
-                            for b in benchmarks if b["name"].startswith("BM_StreamLibrary/") and "per_material" in b}
+            # Named arguments: BM_StreamLibrary/materials:N/budget:1 (the budget checked).
+            per_material = {}
+            for b in benchmarks:
+                args = dict(part.split(":", 1) for part in b["name"].split("/")[1:] if ":" in part)
+                if (b["name"].startswith("BM_StreamLibrary/") and "per_material" in b
+                        and args.get("budget", "1") == "1"):
+                    per_material[int(args["materials"])] = b["per_material"]
             if len(per_material) > 1:
                 small, large = min(per_material), max(per_material)
                 print(f"  {f'BM_StreamLibrary time per material, {large} / {small} materials':<62} "

@@ -146,6 +146,20 @@ def test_parallel_jobs_write_the_same_documents(tmp_path):
     assert outputs["1"] == outputs["2"] == outputs["5"]
     assert outputs["1"]["f1.zelopt.xml"].decode() == module_text(inputs[1])
 
+    # A system that gives fewer threads than asked for: those it gave (or the
+    # main thread alone) do all the work.
+    limit = os.environ.get("DEXMOR_THREAD_LIMIT")
+    if not limit:
+        pytest.skip("DEXMOR_THREAD_LIMIT names no thread-limiting library")
+    env = dict(os.environ, LD_PRELOAD=":".join(filter(None, [limit, os.environ.get("LD_PRELOAD")])),
+               ASAN_OPTIONS=os.environ.get("ASAN_OPTIONS", "") + ":verify_asan_link_order=0")
+    for threads in ("0", "1"):
+        target = tmp_path / f"limited{threads}"
+        run = subprocess.run([CLI, "xml", "-q", "-o", target, "-j", "5", *inputs], stderr=subprocess.PIPE,
+                             env=dict(env, DEXMOR_TEST_THREADS=threads), timeout=60)
+        assert (run.returncode, run.stderr) == (0, b"")
+        assert {p.name: p.read_bytes() for p in target.iterdir()} == outputs["1"]
+
 
 def test_output_files_match_standard_output_for_damaged_libraries(tmp_path):
     # Into -o a library is read once and what it wrote is dropped if a later
