@@ -16,15 +16,13 @@ namespace {
 
 enum SlotState : int { kFree, kFilling, kEntered };
 
-struct Slot {
-    std::atomic<int> state{kFree};
-    char path[PATH_MAX];
-};
-
 // As many temporaries as the tool has threads at most; a conversion beyond that
-// simply is not cleaned up on a signal.
+// simply is not cleaned up on a signal. The states are one small array and the
+// paths another, which stays untouched (zero pages, not memory) but for the
+// slots in use.
 constexpr std::size_t kSlots = 1024;
-std::array<Slot, kSlots> slots;
+constinit std::array<std::atomic<int>, kSlots> states{};
+char paths[kSlots][PATH_MAX];
 
 constexpr int kSignals[] = {SIGINT, SIGTERM, SIGHUP};
 
@@ -39,8 +37,8 @@ void removeAllAndDie(int signal) {
         const timespec millisecond{0, 1000000};
         ::nanosleep(&millisecond, nullptr);
     }
-    for (Slot& slot : slots)
-        if (slot.state.load(std::memory_order_acquire) == kEntered) ::unlink(slot.path);
+    for (std::size_t i = 0; i < kSlots; ++i)
+        if (states[i].load(std::memory_order_acquire) == kEntered) ::unlink(paths[i]);
     // The handler was installed to run once: the signal now takes its default
     // action, which ends the process with the status the parent expects.
     ::raise(signal);
@@ -52,17 +50,17 @@ int enter(std::string_view path) {
     if (path.size() >= PATH_MAX) return -1;
     for (std::size_t i = 0; i < kSlots; ++i) {
         int expected = kFree;
-        if (!slots[i].state.compare_exchange_strong(expected, kFilling, std::memory_order_acquire)) continue;
-        std::memcpy(slots[i].path, path.data(), path.size());
-        slots[i].path[path.size()] = '\0';
-        slots[i].state.store(kEntered, std::memory_order_release);
+        if (!states[i].compare_exchange_strong(expected, kFilling, std::memory_order_acquire)) continue;
+        std::memcpy(paths[i], path.data(), path.size());
+        paths[i][path.size()] = '\0';
+        states[i].store(kEntered, std::memory_order_release);
         return static_cast<int>(i);
     }
     return -1;
 }
 
 void leave(int slot) {
-    if (slot >= 0) slots[static_cast<std::size_t>(slot)].state.store(kFree, std::memory_order_release);
+    if (slot >= 0) states[static_cast<std::size_t>(slot)].store(kFree, std::memory_order_release);
 }
 
 NamingWindow::NamingWindow() {
