@@ -27,6 +27,7 @@ set(DEXMOR_PUBLIC_HEADERS
   materials/BaseMaterial.hpp
   materials/CompositeMaterials.hpp
   materials/LayeredMaterials.hpp
+  materials/ListReplay.hpp
   materials/MaterialAssets.hpp
   materials/MaterialKind.hpp
   materials/Materials.hpp

@@ -182,6 +182,8 @@ BRDFPtr cheapestLayer() {
 
 void keepHostileShapes() {
     keepLibrary("lib_amplify_quoted_name_layers", {hostile::amplifier(2000, 40, cheapestLayer)});
+    // Just past the length from which a conversion reads a list again instead of holding it.
+    keepLibrary("lib_long_layer_list", {hostile::amplifier(1, ListReplay::kHeldItems + 1, cheapestLayer)});
     keepLibrary("lib_hostile_names", hostile::hostileNameLibrary());
     keepLibrary("lib_deepest_bump_chain", {hostile::deepestChain(hostile::bumpChain)});
     keepLibrary("lib_deepest_texture_chain", {hostile::deepestChain(hostile::textureChain)});
@@ -214,6 +216,17 @@ int main(int argc, char** argv) {
             << generation2({hostile::amplifier(std::stoul(argv[2]), std::stoul(argv[3]), cheapestLayer)});
         return 0;
     }
+    if (argc == 4 && std::string_view(argv[1]) == "--sub-materials") {
+        // make_seeds --sub-materials COUNT FILE: one multi material of COUNT empty
+        // multi materials, the cheapest long list, to measure with.
+        const ConversionContext context;
+        auto multi = boost::make_shared<MaterialMulti>();
+        multi->name = "Set";
+        for (unsigned long i = std::stoul(argv[2]); i > 0; --i)
+            multi->subMaterials.push_back(boost::make_shared<MaterialMulti>());
+        std::ofstream(argv[3], std::ios::binary) << generation2({multi});
+        return 0;
+    }
     if (argc >= 4 && std::string_view(argv[1]) == "--names") {
         // make_seeds --names FILE NAME...: one material of 20 layers per name (as
         // UTF-8), so that each name stands in 20 urls: documents of any width of
@@ -237,6 +250,7 @@ int main(int argc, char** argv) {
     if (argc != 3) {
         std::fprintf(stderr, "usage: make_seeds SAMPLE_DIR OUTPUT_DIR\n"
                              "       make_seeds --amplifier NAME_LENGTH LAYERS FILE\n"
+                             "       make_seeds --sub-materials COUNT FILE\n"
                              "       make_seeds --names FILE NAME...\n"
                              "       make_seeds --hostile-names FILE\n");
         return 2;

@@ -2,6 +2,7 @@
 
 #include "files/SinkWriter.hpp"
 
+#include <dexmor/materials/ListReplay.hpp>
 #include <dexmor/materials/MaterialAssets.hpp>
 
 #include <algorithm>
@@ -61,9 +62,17 @@ private:
 } // namespace
 
 bool LibraryConversion::readMaterials(Diagnosis& result, const std::function<void(MaterialPtr&&)>& take) {
+    // Each material is written as soon as it has read, while its archive lives:
+    // its lists need not all be held (see ListReplay.hpp).
+    ListReplay replayLongLists{.enabled = true};
+    PerConversion<ListReplay>::Use replaying(replayLongLists);
+    const auto takeAndStartAgain = [&](MaterialPtr&& material) {
+        take(std::move(material));
+        replayLongLists.heldItems = 0;
+    };
     ReadFailure failure;
     std::optional<ZelMatFile::Framing> framing = ZelMatFile::readFraming(bytes_, &failure);
-    if (framing && ZelMatFile::readMaterials(*framing, take, failure)) {
+    if (framing && ZelMatFile::readMaterials(*framing, takeAndStartAgain, failure)) {
         result.readsAsBinary = true;
         result.description = describe(*framing);
         return true;

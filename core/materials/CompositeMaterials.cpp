@@ -17,7 +17,7 @@ using record::field;
 using record::since;
 
 constexpr std::array kMultiFields = {
-    field<&MaterialMulti::subMaterials>("subMaterials"),
+    replay::listRow<&MaterialMulti::subMaterials, &MaterialMulti::replayedSubMaterials>("subMaterials"),
     nameItem<MaterialMulti>(between(1, 1)),
     baseRecord<MaterialMulti>(since(2)),
 };

@@ -16,7 +16,7 @@ using record::field;
 using record::since;
 
 constexpr std::array kLayeredFields = {
-    field<&MaterialLayeredBRDF::layers>("layers"),
+    replay::listRow<&MaterialLayeredBRDF::layers, &MaterialLayeredBRDF::replayedLayers>("layers"),
     field<&MaterialLayeredBRDF::doubleSided>("doubleSided"),
     field<&MaterialLayeredBRDF::option1>("option1"),
     field<&MaterialLayeredBRDF::option2>("option2", since(3)),
@@ -63,6 +63,7 @@ void MaterialLayeredBRDF::writeXml(AssetXmlWriter& writer, std::string urlPrefix
 void MaterialLayeredBRDF::writeLayerAssets(AssetXmlWriter& writer, const std::string& url) const {
     for (const BRDFPtr& layer : layers)
         if (layer) layer->writeXml(writer, url);
+    replay::forEach<BRDFPtr>(replayedLayers, [&](const BRDFPtr& layer) { layer->writeXml(writer, url); });
 }
 
 void MaterialLayeredBRDF::writeLayerParameters(AssetXmlWriter& writer, const std::string& url) const {
@@ -70,6 +71,7 @@ void MaterialLayeredBRDF::writeLayerParameters(AssetXmlWriter& writer, const std
     writer.beginList("brdfs", "plugin");
     for (const BRDFPtr& layer : layers)
         if (layer) writer.writeEntry(url + "/" + layer->name);
+    replay::forEach<BRDFPtr>(replayedLayers, [&](const BRDFPtr& layer) { writer.writeEntry(url + "/" + layer->name); });
     writer.endList();
 }
 

@@ -56,6 +56,28 @@ def test_output_budget_stops_the_tool_with_bounded_memory(amplifier, tmp_path):
     assert (run.returncode, run.stdout.decode()) == (0, Dexmor.getZelmatXml(str(SAMPLE)))
 
 
+def test_one_material_of_very_many_layers_converts_in_bounded_memory(tmp_path):
+    """150,000 layers in 7 MB: their objects alone would take 30 MB more than the file."""
+    sanitized = "LD_PRELOAD" in os.environ  # slower, and keeps freed memory on purpose
+    path = tmp_path / "layers.zelmat"
+    subprocess.run([MAKE_SEEDS, "--amplifier", "1", "5000" if sanitized else "150000", str(path)], check=True)
+    outputs = []
+    for target in (None, tmp_path / "out"):
+        args = ["-o", str(target)] if target else []
+        # The peak from /usr/bin/time: a child forked by this interpreter would
+        # count the interpreter's own pages from before it ran the tool.
+        with open(tmp_path / "stdout.xml", "wb") as stdout:
+            run = subprocess.run(["/usr/bin/time", "-f", "%M", "-o", tmp_path / "peak", CLI, "xml", "-q", *args, path],
+                                 stdout=stdout, stderr=subprocess.PIPE, timeout=120)
+        assert (run.returncode, run.stderr) == (0, b"")
+        peak = int((tmp_path / "peak").read_text().split()[-1])
+        if not sanitized:
+            assert peak * 1024 < path.stat().st_size + (16 << 20), f"peak {peak} KiB"
+        outputs.append((target / "layers.zelmat.xml" if target else tmp_path / "stdout.xml").read_bytes())
+    assert outputs[0] == outputs[1] == Dexmor.getZelmatXml(str(path)).encode()
+    assert outputs[0].count(b"<Asset ") == (5000 if sanitized else 150000) + 1
+
+
 def test_output_budget_bounds_the_reports_too(amplifier):
     # check and list make the document to survey it: the budget bounds their time.
     for command, done in (("check", "checked"), ("list", "listed")):

@@ -136,6 +136,8 @@ public:
     bool canHold(std::uint64_t count, std::uint64_t itemSize) const;
     // Advances the read position without reading.
     void skip(std::uint64_t bytes);
+    // Reads on from `position` (one the reading has passed before).
+    void seekRead(std::uint64_t position) { readPos_ = position; }
 
     // --- bytes ---
     void putByte(std::uint8_t b);

@@ -18,6 +18,7 @@
 // The multi and both two-sided kinds read over their current fields (the multi
 // appends to its list); the angle blend resets first. Only the multi's reset takes
 // a new default name.
+#include <dexmor/materials/ListReplay.hpp>
 #include <dexmor/materials/MaterialKind.hpp>
 
 #include <span>
@@ -39,6 +40,9 @@ public:
 
     // Every entry is required by the record. Copies share the entries.
     std::vector<MaterialPtr> subMaterials;
+    // While a library is converted, very many sub-materials are checked and not
+    // held (the document shows none of them; see ListReplay.hpp).
+    ReplayedList replayedSubMaterials;
 
     static std::span<const record::Field<MaterialMulti>> fields();
     bool canBeWritten() const;

@@ -22,6 +22,7 @@
 //
 // The integer options other than doubleSided are stored, compared and copied,
 // never shown in the XML.
+#include <dexmor/materials/ListReplay.hpp>
 #include <dexmor/materials/MaterialKind.hpp>
 
 #include <span>
@@ -44,6 +45,9 @@ public:
     using MaterialKind::MaterialKind;
 
     std::vector<BRDFPtr> layers; // first layer first
+    // While a library is converted, the layers of a material with very many are
+    // not held but read again as they are written (see ListReplay.hpp).
+    ReplayedList replayedLayers;
     std::int32_t doubleSided = 1;
     std::int32_t option1 = 0;
     std::int32_t option2 = 1;
