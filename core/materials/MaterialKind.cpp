@@ -1,5 +1,6 @@
 #include <dexmor/materials/MaterialKind.hpp>
 
+#include <dexmor/materials/ListReplay.hpp>
 #include <dexmor/materials/SceneMaterials.hpp>
 
 namespace OrvexKavorCore::material {
@@ -8,11 +9,14 @@ bool TextList::read(QuickArchive& ar, std::vector<std::string>& list) {
     const auto count = ar.get<std::uint32_t>();
     if (!ar.canHold(count, 4)) return ar.fail("a list of " + std::to_string(count) + " texts cannot fit in the data");
     list.clear();
-    list.reserve(count);
+    // The only such list, the object exclusion's names, shows in no asset of a
+    // library: past the items a converted material may hold, it is checked only.
+    const bool held = replay::holds(ar, count, true);
+    if (held) list.reserve(count);
     for (std::uint32_t i = 0; i < count; ++i) {
         std::string text;
         if (!ar.readWString(text)) return false;
-        list.push_back(std::move(text));
+        if (held) list.push_back(std::move(text));
     }
     return true;
 }

@@ -116,6 +116,14 @@ TEST(LongLists, AreNotHeldWhileALibraryIsConverted) {
     EXPECT_GT(heldBelow(nested), ListReplay::kHeldItems / 2);
     EXPECT_LE(heldBelow(nested), ListReplay::kHeldItems);
 
+    // The object exclusion's names show in no asset either.
+    auto exclusion = boost::make_shared<MaterialObjectExclusion>();
+    exclusion->baseMtl = hostile::diffuseMaterial();
+    exclusion->objects.assign(ListReplay::kHeldItems + 1, "Chair");
+    const std::string excluding = hostile::libraryOf(MaterialPtr(exclusion));
+    EXPECT_TRUE(dynamic_cast<const MaterialObjectExclusion&>(*readAsConverted(excluding)).objects.empty());
+    EXPECT_EQ(testsupport::convertBytesToXml(FileKind::MaterialLibrary, excluding), materialToXml(exclusion));
+
     // An unknown kind id in the list, first or last: the file fails there.
     const std::size_t itemSize = hostile::libraryOf(MaterialPtr(empty())).size() - 8;
     const std::size_t firstItem = 8 + 4 + 4 + 4; // header, the multi's kind id, version word, count

@@ -45,18 +45,25 @@ struct ReplayedList {
 
 namespace replay {
 
+// Whether a list of `count` items that starts empty is held (counted against
+// the material's items), or only checked (the conversion replays lists and it
+// would take the material beyond the items it may hold).
+inline bool holds(const QuickArchive& ar, std::uint32_t count, bool startsEmpty) {
+    ListReplay& state = PerConversion<ListReplay>::current();
+    const bool forget =
+        state.enabled && startsEmpty && !ar.observer() && state.heldItems + count > ListReplay::kHeldItems;
+    if (!forget) state.heldItems += count;
+    return !forget;
+}
+
 // Reads a list of required members (UInt32 count, then the items) into `list`,
-// or, when the conversion replays lists and this one would take the material
-// beyond the items it may hold, checks its items and notes where they are in
-// `replayed`. False when an item fails.
+// or, when it is not held (see holds), checks its items and notes where they
+// are in `replayed`. False when an item fails.
 template <class Ptr>
 bool readList(QuickArchive& ar, std::vector<Ptr>& list, ReplayedList& replayed) {
     const auto count = ar.get<std::uint32_t>();
     if (!ar.canHold(count, 8)) return ar.fail("a list of " + std::to_string(count) + " cannot fit in the data");
-    ListReplay& state = PerConversion<ListReplay>::current();
-    const bool forget = state.enabled && state.heldItems + count > ListReplay::kHeldItems && list.empty() &&
-                        !ar.observer();
-    if (!forget) state.heldItems += count;
+    const bool forget = !holds(ar, count, list.empty());
     replayed = forget ? ReplayedList{&ar, ar.readPosition(), 0} : ReplayedList{};
     for (std::uint32_t i = 0; i < count; ++i) {
         Ptr item;
