@@ -19,8 +19,10 @@ CLI = os.path.abspath(os.environ["DEXMOR_CLI"]) if "DEXMOR_CLI" in os.environ el
 MAKE_SEEDS = os.environ.get("DEXMOR_MAKE_SEEDS")
 SOURCE_DIR = pathlib.Path(os.environ.get("DEXMOR_SOURCE_DIR", pathlib.Path(__file__).resolve().parents[2]))
 SAMPLE = SOURCE_DIR / "examples" / "sample.zelmat"
-# The deepest chain of bump materials the reader accepts, from the seed corpus.
-DEEPEST_BUMP_CHAIN = SOURCE_DIR / "fuzz" / "corpus" / "fuzz_zelmat" / "db19645d14f05615619f5ef9e2ffd1ef706826a1"
+# The deepest chains the reader accepts, from the seed corpus (make_seeds'
+# lib_deepest_bump_chain and lib_deepest_texture_chain).
+DEEPEST_CHAINS = [SOURCE_DIR / "fuzz" / "corpus" / "fuzz_zelmat" / name
+                  for name in ("f2ac6913c78a2bb0fb5a64a0267e285b6096a2cb", "ad8f5f6b53febfa1302eccb3b41877706c4f2c4d")]
 
 
 def dexmor(*args, stdout=subprocess.PIPE, **kwargs):
@@ -163,9 +165,11 @@ def test_a_closed_standard_output_is_reported_once():
     assert run.stderr.decode().count("cannot write to standard output") == 1
 
 
-def test_the_deepest_chain_converts_on_a_128_kib_thread(tmp_path):
+@pytest.mark.parametrize("seed", DEEPEST_CHAINS, ids=["bump materials", "textures"])
+def test_the_deepest_chain_converts_on_a_128_kib_thread(tmp_path, seed):
     chain = tmp_path / "chain.zelmat"
-    chain.write_bytes(DEEPEST_BUMP_CHAIN.read_bytes())
+    chain.write_bytes(seed.read_bytes())
+    assert Dexmor.diagnose(str(chain)) is None  # reads as binary
     expected = Dexmor.getZelmatXml(str(chain))
     assert expected.startswith("<Assets>")
     results = []
