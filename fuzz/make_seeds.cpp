@@ -182,8 +182,6 @@ BRDFPtr cheapestLayer() {
 
 void keepHostileShapes() {
     keepLibrary("lib_amplify_quoted_name_layers", {hostile::amplifier(2000, 40, cheapestLayer)});
-    // Just past the length from which a conversion reads a list again instead of holding it.
-    keepLibrary("lib_long_layer_list", {hostile::amplifier(1, ListReplay::kHeldItems + 1, cheapestLayer)});
     keepLibrary("lib_hostile_names", hostile::hostileNameLibrary());
     keepLibrary("lib_deepest_bump_chain", {hostile::deepestChain(hostile::bumpChain)});
     keepLibrary("lib_deepest_texture_chain", {hostile::deepestChain(hostile::textureChain)});
