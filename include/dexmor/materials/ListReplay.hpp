@@ -91,10 +91,12 @@ constexpr auto listRow(const char* name) {
     };
 }
 
-// Calls `visit` with each item of `replayed`, read again, in order; the reading
-// position and the default sun are as they were afterwards.
+// Reads the items of `replayed` again, in order, each with `readItem` (given the
+// archive at the item and its index; false stops). The reading position and the
+// default sun are as they were before, afterwards.
 void readAgain(const ReplayedList& replayed, const std::function<bool(QuickArchive&, std::uint32_t)>& readItem);
 
+// Calls `visit` with each item of `replayed`, read again, in order.
 template <class Ptr>
 void forEach(const ReplayedList& replayed, const std::function<void(const Ptr&)>& visit) {
     readAgain(replayed, [&visit](QuickArchive& ar, std::uint32_t index) {
