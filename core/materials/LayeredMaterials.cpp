@@ -60,18 +60,21 @@ void MaterialLayeredBRDF::writeXml(AssetXmlWriter& writer, std::string urlPrefix
     kind::endAsset(writer);
 }
 
-void MaterialLayeredBRDF::writeLayerAssets(AssetXmlWriter& writer, const std::string& url) const {
+// Each layer in order: the held ones, or those read again (see ListReplay.hpp).
+void MaterialLayeredBRDF::forEachLayer(const std::function<void(const BRDFPtr&)>& visit) const {
     for (const BRDFPtr& layer : layers)
-        if (layer) layer->writeXml(writer, url);
-    replay::forEach<BRDFPtr>(replayedLayers, [&](const BRDFPtr& layer) { layer->writeXml(writer, url); });
+        if (layer) visit(layer);
+    replay::forEach<BRDFPtr>(replayedLayers, visit);
+}
+
+void MaterialLayeredBRDF::writeLayerAssets(AssetXmlWriter& writer, const std::string& url) const {
+    forEachLayer([&](const BRDFPtr& layer) { layer->writeXml(writer, url); });
 }
 
 void MaterialLayeredBRDF::writeLayerParameters(AssetXmlWriter& writer, const std::string& url) const {
     writer.writeInteger("double_sided", doubleSided);
     writer.beginList("brdfs", "plugin");
-    for (const BRDFPtr& layer : layers)
-        if (layer) writer.writeEntry(url + "/" + layer->name);
-    replay::forEach<BRDFPtr>(replayedLayers, [&](const BRDFPtr& layer) { writer.writeEntry(url + "/" + layer->name); });
+    forEachLayer([&](const BRDFPtr& layer) { writer.writeEntry(url + "/" + layer->name); });
     writer.endList();
 }
 

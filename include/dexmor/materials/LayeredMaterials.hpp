@@ -25,6 +25,7 @@
 #include <dexmor/materials/ListReplay.hpp>
 #include <dexmor/materials/MaterialKind.hpp>
 
+#include <functional>
 #include <span>
 #include <string>
 #include <vector>
@@ -67,6 +68,9 @@ public:
     void writeLayerAssets(AssetXmlWriter& writer, const std::string& url) const;
     // "double_sided" and "brdfs" (url + "/" + layer name per layer).
     void writeLayerParameters(AssetXmlWriter& writer, const std::string& url) const;
+
+private:
+    void forEachLayer(const std::function<void(const BRDFPtr&)>& visit) const;
 };
 
 class MaterialSingleBRDF final : public MaterialKind<MaterialSingleBRDF> {

@@ -56,20 +56,23 @@ inline bool holds(const QuickArchive& ar, std::uint32_t count, bool startsEmpty)
     return !forget;
 }
 
-// Reads a list of required members (UInt32 count, then the items) into `list`,
-// or, when it is not held (see holds), checks its items and notes where they
-// are in `replayed`. False when an item fails.
+// Reads a list of required members (UInt32 count, then the items), appending
+// each item that reads to `list`. A list that may be replayed (`replayed` given)
+// and is not held (see holds) has its items checked only, and where they are
+// noted in `replayed`. A member record takes at least its kind id and a version
+// word, so a count that cannot fit in the remaining bytes fails at once. False
+// when an item fails.
 template <class Ptr>
-bool readList(QuickArchive& ar, std::vector<Ptr>& list, ReplayedList& replayed) {
+bool readList(QuickArchive& ar, std::vector<Ptr>& list, ReplayedList* replayed) {
     const auto count = ar.get<std::uint32_t>();
     if (!ar.canHold(count, 8)) return ar.fail("a list of " + std::to_string(count) + " cannot fit in the data");
-    const bool forget = !holds(ar, count, list.empty());
-    replayed = forget ? ReplayedList{&ar, ar.readPosition(), 0} : ReplayedList{};
+    const bool forget = replayed && !holds(ar, count, list.empty());
+    if (replayed) *replayed = forget ? ReplayedList{&ar, ar.readPosition(), 0} : ReplayedList{};
     for (std::uint32_t i = 0; i < count; ++i) {
         Ptr item;
         if (!readMember(ar, item, nullptr, i)) return false;
         if (forget)
-            ++replayed.count;
+            ++replayed->count;
         else
             list.push_back(std::move(item));
     }
@@ -85,7 +88,7 @@ constexpr auto listRow(const char* name) {
     return record::Field<Obj>{
         name,
         record::always(),
-        [](QuickArchive& ar, Obj& object) { return readList(ar, object.*List, object.*Replayed); },
+        [](QuickArchive& ar, Obj& object) { return readList(ar, object.*List, &(object.*Replayed)); },
         held.write,
         held.equal,
     };

@@ -41,6 +41,7 @@
 #include <dexmor/archive/Record.hpp>
 #include <dexmor/brdfs/Base_BRDF.hpp>
 #include <dexmor/materials/BaseMaterial.hpp>
+#include <dexmor/materials/ListReplay.hpp>
 #include <dexmor/model/Kind.hpp>
 #include <dexmor/textures/BaseTexture.hpp>
 
@@ -65,21 +66,11 @@ struct Required {
     static bool equal(const Ptr& a, const Ptr& b) { return membersEqual(a, b); }
 };
 
-// A list of required members: UInt32 count, then the items. Reading appends
-// each item that reads. A member record takes at least its kind id and a version word, so a
-// count that cannot fit in the remaining bytes fails at once.
+// A list of required members: UInt32 count, then the items, all held (see
+// replay::readList; replay::listRow for a list a conversion may replay).
 template <class Ptr>
 struct List {
-    static bool read(QuickArchive& ar, std::vector<Ptr>& list) {
-        const auto count = ar.get<std::uint32_t>();
-        if (!ar.canHold(count, 8)) return ar.fail("a list of " + std::to_string(count) + " cannot fit in the data");
-        for (std::uint32_t i = 0; i < count; ++i) {
-            Ptr item;
-            if (!readMember(ar, item, nullptr, i)) return false;
-            list.push_back(std::move(item));
-        }
-        return true;
-    }
+    static bool read(QuickArchive& ar, std::vector<Ptr>& list) { return replay::readList(ar, list, nullptr); }
     static bool write(QuickArchive& ar, const std::vector<Ptr>& list) {
         ar.write(static_cast<std::uint32_t>(list.size()));
         for (const Ptr& item : list)
