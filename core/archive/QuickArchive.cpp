@@ -185,16 +185,31 @@ bool QuickArchive::observedCopy(void* data, std::size_t length, Encoding encodin
     return complete;
 }
 
-// Reads a compound value while the observer is set aside (its parts are not
-// values of their own), then reports it whole.
+// The observer set aside while a value's parts are read: they are not values
+// of their own, and the whole is reported once read.
+class QuickArchive::Unobserved {
+public:
+    explicit Unobserved(QuickArchive& ar) : ar_(ar), observer_(ar.observer_), start_(ar.readPos_) {
+        ar.observer_ = nullptr;
+    }
+    ~Unobserved() { ar_.observer_ = observer_; }
+    Unobserved(const Unobserved&) = delete;
+    Unobserved& operator=(const Unobserved&) = delete;
+    ReadObserver& observer() const { return *observer_; }
+    std::uint64_t start() const { return start_; }
+    std::uint64_t size() const { return ar_.readPos_ - start_; }
+
+private:
+    QuickArchive& ar_;
+    ReadObserver* observer_;
+    std::uint64_t start_;
+};
+
 template <class T>
 void QuickArchive::observedCompound(T& v, Encoding encoding) {
-    ReadObserver* const observer = observer_;
-    const std::uint64_t start = readPos_;
-    observer_ = nullptr;
+    const Unobserved aside(*this);
     read(v);
-    observer_ = observer;
-    observer->value(start, readPos_ - start, encoding, &v);
+    aside.observer().value(aside.start(), aside.size(), encoding, &v);
 }
 template void QuickArchive::observedCompound(bool&, Encoding); // for read(bool&), inline
 
@@ -244,27 +259,23 @@ void QuickArchive::writeString(std::string_view narrow) {
 }
 
 bool QuickArchive::observedCounted(std::string& out, Encoding encoding) {
-    ReadObserver* const observer = observer_;
-    const std::uint64_t start = readPos_;
-    observer_ = nullptr;
+    const Unobserved aside(*this);
     const bool read = encoding == Encoding::WString ? readWString(out) : readString(out);
-    observer_ = observer;
-    if (read) {
-        observer->value(start, readPos_ - start, encoding, &out);
-    } else {
-        reportRefusedCount(start);
-    }
+    if (read)
+        aside.observer().value(aside.start(), aside.size(), encoding, &out);
+    else
+        reportRefusedCount(aside);
     return read;
 }
 
-void QuickArchive::reportRefusedCount(std::uint64_t start) {
+void QuickArchive::reportRefusedCount(const Unobserved& aside) {
     // Only the count was read: it is what the user needs to see.
     const std::uint64_t end = readPos_;
-    readPos_ = start;
+    readPos_ = aside.start();
     std::uint32_t count = 0;
     copyOut(&count, sizeof count);
     readPos_ = end;
-    observer_->value(start, end - start, Encoding::UInt32, &count);
+    aside.observer().value(aside.start(), aside.size(), Encoding::UInt32, &count);
 }
 
 bool QuickArchive::readString(std::string& out) {
@@ -311,15 +322,12 @@ void QuickArchive::writeBytes(const void* data, std::uint32_t length) {
 // with the one they expected.
 std::optional<std::uint32_t> QuickArchive::readBytes(void* buffer, std::uint32_t capacity, bool strict) {
     if (observer_) [[unlikely]] {
-        ReadObserver* const observer = observer_;
-        const std::uint64_t start = readPos_;
-        observer_ = nullptr;
+        const Unobserved aside(*this);
         const std::optional<std::uint32_t> stored = readBytes(buffer, capacity, strict);
-        observer_ = observer;
         if (!stored)
-            reportRefusedCount(start);
-        else if (readPos_ != start) // a strict read that went back reported nothing: the next reader reads it
-            observer->value(start, readPos_ - start, Encoding::Bytes, &*stored);
+            reportRefusedCount(aside);
+        else if (aside.size() != 0) // a strict read that went back reported nothing: the next reader reads it
+            aside.observer().value(aside.start(), aside.size(), Encoding::Bytes, &*stored);
         return stored;
     }
     const std::uint64_t start = readPos_;

@@ -380,7 +380,8 @@ private:
     template <class T>
     [[gnu::noinline, gnu::cold]] void observedAs(const char* name, T& value);
     [[gnu::cold]] bool refuseVersion(VersionWord version, std::string_view what);
-    void reportRefusedCount(std::uint64_t start);
+    class Unobserved;
+    void reportRefusedCount(const Unobserved& aside);
 
     std::vector<boost::shared_ptr<Chunk>> chunks_;
     std::uint64_t readPos_ = 0;
